@@ -1,0 +1,39 @@
+#include <gtest/gtest.h>
+
+#include <thread>
+
+#include "foundation/Error.h"
+#include "support/LogCapture.h"
+
+namespace Glimmer {
+namespace {
+
+TEST(Error, SlotIsPerThread) {
+    Error::SetError(kErrorNotFound);
+    int otherBefore = -1;
+    int otherAfter = -1;
+    std::thread other([&] {
+        otherBefore = Error::GetError();
+        Error::SetError(kErrorFileOpen);
+        otherAfter = Error::GetError();
+    });
+    other.join();
+    EXPECT_EQ(otherBefore, 0);
+    EXPECT_EQ(otherAfter, 11);
+    EXPECT_EQ(Error::GetError(), 9);
+}
+
+TEST(Error, ReportLogsCodeAndLineUnderTag) {
+    Testing::LogCapture capture;
+    GX_REPORT_ERROR("GxString", kErrorAlreadyConstructed);
+    const int line = __LINE__ - 1;
+    EXPECT_EQ(Error::GetError(), 4);
+    auto lines = capture.Lines();
+    ASSERT_EQ(lines.size(), 1u);
+    EXPECT_EQ(lines[0].priority, 6);
+    EXPECT_EQ(lines[0].tag, "GxString");
+    EXPECT_EQ(lines[0].message, "@ Native Error 4 : " + std::to_string(line));
+}
+
+}  // namespace
+}  // namespace Glimmer
