@@ -54,11 +54,19 @@ GxBitmap::GxBitmap(const GxBitmap& source, GxRect* rect)
     size_t bytes = 0;
     if (!PixelBytes(width, height, bytesPerPixel, &bytes)) return;
     pixels = AllocatePixels(bytes);
-    if (pixels == nullptr || source.pixels == nullptr) return;
+    size_t sourceBytes = 0;
+    if (pixels == nullptr || source.pixels == nullptr ||
+        !PixelBytes(source.width, source.height, source.bytesPerPixel, &sourceBytes)) {
+        return;
+    }
+    // The rectangle is meant to lie inside the source and is not clipped; a
+    // byte it names outside the source's block is skipped rather than read.
     for (int32_t y = rect->top; y < rect->bottom; ++y) {
         for (int32_t x = rect->left; x < rect->right; ++x) {
-            pixels[(x - rect->left) + (y - rect->top) * size_t(width)] =
-                source.pixels[x + y * size_t(source.width)];
+            const int64_t from = int64_t(x) + int64_t(y) * source.width;
+            if (from < 0 || uint64_t(from) >= sourceBytes) continue;
+            pixels[size_t(int64_t(x) - rect->left) + size_t(int64_t(y) - rect->top) * width] =
+                source.pixels[from];
         }
     }
 }

@@ -100,6 +100,16 @@ TEST(GxBitmap, SubImageCopiesOneBytePerPixel) {
     GxBitmap none(src, &swapped);
     EXPECT_EQ(none.width, 2u);
     EXPECT_EQ(none.height, 2u);
+    // A rectangle reaching outside the source reads nothing beyond its block.
+    GxRect outside(-2, 2, 2, 4);
+    GxBitmap partly(src, &outside);
+    ASSERT_EQ(partly.width, 4u);
+    ASSERT_NE(partly.pixels, nullptr);
+    EXPECT_EQ(partly.pixels[0], 6);  // byte -2 + 2 x 4
+    EXPECT_EQ(partly.pixels[3], 9);
+    // Corners at the ends of the int32 range: the size is their distance.
+    GxRect wide(INT32_MIN, 0, INT32_MAX, 0);
+    EXPECT_EQ(uint32_t(wide.Width()), 0xFFFFFFFFu);
 }
 
 TEST(GxBitmap, DeletesThroughBasePointers) {
