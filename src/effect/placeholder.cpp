@@ -1,1 +1,0 @@
-// Replaced by the effect engine's units.

@@ -1,0 +1,303 @@
+// The compositor: each blend rule on hand-computed pixels, the clipping
+// edges, and the properties that hold for every input.
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <bit>
+#include <climits>
+#include <cstdint>
+#include <cstring>
+#include <vector>
+
+#include "effect/GxBlendRows.h"
+#include "effect/GxBlender.h"
+#include "foundation/GxBitmap.h"
+#include "support/LogCapture.h"
+
+namespace Glimmer {
+namespace {
+
+using Px = std::array<int, 4>;  // R, G, B, A
+
+void Set(GxBitmap& b, int x, int y, Px p) {
+    uint8_t* d = b.pixels + (size_t(y) * b.width + x) * 4;
+    for (int c = 0; c < 4; ++c) d[c] = uint8_t(p[c]);
+}
+
+Px Get(const GxBitmap& b, int x, int y) {
+    const uint8_t* d = b.pixels + (size_t(y) * b.width + x) * 4;
+    return {d[0], d[1], d[2], d[3]};
+}
+
+// One pixel through an 8-bit-source operation.
+template <typename Op>
+Px Blend1(Px dst, uint8_t coverage, Op op) {
+    GxBitmap b(1, 1, 4);
+    Set(b, 0, 0, dst);
+    op(&b, &coverage);
+    return Get(b, 0, 0);
+}
+
+Px Mode(int mode, unsigned color, Px dst, uint8_t m) {
+    return Blend1(dst, m, [&](GxBitmap* b, const uint8_t* s) {
+        GxBlender::drawBitmapBlend8(0, 0, b, s, 1, 1, 1, color, mode);
+    });
+}
+
+// --- blend rules, one hand-computed pixel per case
+
+TEST(BlenderRules, SourceOverCoverage) {
+    // s = 129 * 255 -> a = 128, k = 127.
+    EXPECT_EQ(Mode(1, 0x80FF8040, Px{10, 20, 30, 40}, 255), (Px{255, 138, 79, 148}));
+    // Fully opaque coverage replaces the pixel with the colour.
+    EXPECT_EQ(Mode(1, 0xFF112233, Px{9, 9, 9, 9}, 255), (Px{0x11, 0x22, 0x33, 255}));
+    // Faint coverage leaves no trace: (254 + 1) * 1 does not exceed 255 ...
+    EXPECT_EQ(Mode(1, 0xFEFFFFFF, Px{1, 2, 3, 4}, 1), (Px{1, 2, 3, 4}));
+    EXPECT_EQ(Mode(1, 0x00FFFFFF, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4}));
+    // ... while (255 + 1) * 1 does: a = 1, k = 254.
+    EXPECT_EQ(Mode(1, 0xFFFFFFFF, Px{0, 0, 0, 0}, 1), (Px{1, 1, 1, 1}));
+}
+
+TEST(BlenderRules, DestinationOverCoverage) {
+    EXPECT_EQ(Mode(2, 0xFF204060, Px{0, 0, 0, 0}, 128), (Px{16, 32, 48, 128}));
+    EXPECT_EQ(Mode(2, 0xFF204060, Px{100, 50, 25, 128}, 128), (Px{108, 66, 49, 191}));
+    EXPECT_EQ(Mode(2, 0xFF204060, Px{1, 2, 3, 255}, 255), (Px{1, 2, 3, 255}));
+    EXPECT_EQ(Mode(2, 0xFF204060, Px{1, 2, 3, 4}, 0), (Px{1, 2, 3, 4}));
+}
+
+TEST(BlenderRules, DestinationOverCoverageAsSwitch) {
+    // Any non-zero coverage draws the full colour.
+    EXPECT_EQ(Mode(3, 0x80402010, Px{0, 0, 0, 0}, 1), (Px{64, 32, 16, 128}));
+    EXPECT_EQ(Mode(3, 0x80402010, Px{10, 10, 10, 100}, 1), (Px{49, 29, 20, 178}));
+    EXPECT_EQ(Mode(3, 0x80402010, Px{10, 10, 10, 255}, 9), (Px{10, 10, 10, 255}));
+    EXPECT_EQ(Mode(3, 0x80402010, Px{10, 10, 10, 100}, 0), (Px{10, 10, 10, 100}));
+}
+
+TEST(BlenderRules, TextFillScalesByCoverage) {
+    const unsigned grey = 0xFF808080;
+    // Clear destination: the coverage-scaled colour.
+    EXPECT_EQ(Mode(7, grey, Px{0, 0, 0, 0}, 128), (Px{64, 64, 64, 128}));
+    // Full coverage: destination-over with the unscaled colour.
+    EXPECT_EQ(Mode(7, grey, Px{10, 20, 30, 100}, 255), (Px{88, 98, 108, 255}));
+    EXPECT_EQ(Mode(7, 0x80808080, Px{10, 20, 30, 100}, 255), (Px{88, 98, 108, 178}));
+    // Over an opaque pixel, coverage 128 leaves alpha 128 and halves the colour.
+    EXPECT_EQ(Mode(7, grey, Px{200, 100, 50, 255}, 128), (Px{100, 50, 25, 128}));
+    // Partial over partial: combined, then scaled by m.
+    EXPECT_EQ(Mode(7, grey, Px{40, 40, 40, 100}, 128), (Px{40, 40, 40, 89}));
+    // Outside the glyphs nothing is touched.
+    EXPECT_EQ(Mode(7, grey, Px{40, 40, 40, 100}, 0), (Px{40, 40, 40, 100}));
+    // A product past 16 bits saturates instead of wrapping (505 would read as 249).
+    EXPECT_EQ(Mode(7, 0xFFFF0000, Px{255, 0, 0, 1}, 254), (Px{255, 0, 0, 253}));
+}
+
+TEST(BlenderRules, UnknownModesDrawNothing) {
+    for (int mode : {0, 4, 5, 6, 8, -1, 1000})
+        EXPECT_EQ(Mode(mode, 0xFFFFFFFF, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4})) << mode;
+}
+
+TEST(BlenderRules, OnlyTheTwoDestinationOverModesLog) {
+    Testing::LogCapture log;
+    for (int mode : {1, 2, 3, 7, 4}) Mode(mode, 0xFF000000, Px{0, 0, 0, 0}, 1);
+    const auto lines = log.Lines();
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_EQ(lines[0].tag, "Blender");
+    EXPECT_EQ(lines[0].priority, 3);
+    EXPECT_EQ(lines[0].message, "Blender - GxE_BLEND_DST_OVER_NSA");
+    EXPECT_EQ(lines[1].message, "Blender - GxE_BLEND_OTHER");
+}
+
+TEST(BlenderRules, OverwriteKeepsColourUnscaled) {
+    auto draw = [](Px dst, uint8_t m) {
+        return Blend1(dst, m, [](GxBitmap* b, const uint8_t* s) {
+            GxBlender::drawBitmap(0, 0, b, s, 1, 1, 0x80112233);
+        });
+    };
+    EXPECT_EQ(draw(Px{9, 9, 9, 9}, 200), (Px{0x11, 0x22, 0x33, 100}));
+    EXPECT_EQ(draw(Px{9, 9, 9, 9}, 0), (Px{0x11, 0x22, 0x33, 0}));
+}
+
+TEST(BlenderRules, MaskUnionKeepsLargerCoverage) {
+    GxBitmap mask(3, 1, 1);
+    const uint8_t first[3] = {10, 200, 0};
+    const uint8_t second[3] = {50, 100, 7};
+    GxBlender::drawBitmap(0, 0, &mask, first, 3, 1, 0xFF000000);
+    GxBlender::drawBitmap(0, 0, &mask, second, 3, 1, 0xFF000000);
+    EXPECT_EQ(mask.pixels[0], 50);
+    EXPECT_EQ(mask.pixels[1], 200);
+    EXPECT_EQ(mask.pixels[2], 7);
+}
+
+Px Words(int mode, uint32_t src, Px dst) {
+    GxBitmap b(1, 1, 4);
+    Set(b, 0, 0, dst);
+    GxBlender::drawBitmapBlend32(0, 0, &b, &src, 1, 1, 1, mode);
+    return Get(b, 0, 0);
+}
+
+TEST(BlenderRules, SourceOverImage) {
+    EXPECT_EQ(Words(1, 0x80402010, Px{100, 100, 100, 200}), (Px{114, 82, 66, 227}));
+    EXPECT_EQ(Words(1, 0xFF010203, Px{100, 100, 100, 200}), (Px{1, 2, 3, 255}));
+    // A transparent premultiplied source changes nothing.
+    EXPECT_EQ(Words(1, 0x00000000, Px{100, 90, 80, 70}), (Px{100, 90, 80, 70}));
+}
+
+TEST(BlenderRules, DestinationOverImage) {
+    EXPECT_EQ(Words(2, 0x80402010, Px{10, 10, 10, 100}), (Px{49, 29, 20, 178}));
+    EXPECT_EQ(Words(2, 0x80402010, Px{0, 0, 0, 0}), (Px{64, 32, 16, 128}));
+    EXPECT_EQ(Words(2, 0x00402010, Px{0, 0, 0, 0}), (Px{0, 0, 0, 0}));
+    EXPECT_EQ(Words(2, 0x80402010, Px{7, 7, 7, 255}), (Px{7, 7, 7, 255}));
+    EXPECT_EQ(Words(3, 0x80402010, Px{7, 7, 7, 7}), (Px{7, 7, 7, 7}));
+}
+
+TEST(BlenderRules, DestinationOverByteImageAndItsFlag) {
+    const uint8_t src[4] = {64, 32, 16, 128};  // R, G, B, A
+    auto draw = [&](Px dst, int flag) {
+        GxBitmap b(1, 1, 4);
+        Set(b, 0, 0, dst);
+        GxBlender::drawBitmapBlend32(0, 0, &b, src, 1, 1, 1, 0, flag);
+        return Get(b, 0, 0);
+    };
+    EXPECT_EQ(draw(Px{10, 10, 10, 100}, 0), (Px{49, 29, 20, 178}));
+    EXPECT_EQ(draw(Px{10, 10, 10, 100}, 1), (Px{49, 29, 20, 178}));
+    // Over alpha 0: the flag takes the source as it is; without it the
+    // colour left under alpha 0 is summed in.
+    EXPECT_EQ(draw(Px{5, 5, 5, 0}, 1), (Px{64, 32, 16, 128}));
+    EXPECT_EQ(draw(Px{5, 5, 5, 0}, 0), (Px{69, 37, 21, 128}));
+}
+
+TEST(BlenderRules, RedBlueSwapGivesJavaWords) {
+    GxBitmap b(2, 1, 4);
+    Set(b, 0, 0, Px{1, 2, 3, 4});
+    Set(b, 1, 0, Px{0xFF, 0x80, 0x00, 0x7F});
+    GxBlender::convertBGRAToARGB(&b);
+    EXPECT_EQ(Get(b, 0, 0), (Px{3, 2, 1, 4}));
+    if constexpr (std::endian::native == std::endian::little) {
+        uint32_t word;
+        std::memcpy(&word, b.pixels + 4, 4);
+        EXPECT_EQ(word, 0x7FFF8000u);  // what Java reads: 0xAARRGGBB
+    }
+    GxBlender::convertBGRAToARGB(nullptr);
+    GxBitmap empty;
+    GxBlender::convertBGRAToARGB(&empty);
+    GxBitmap mask(2, 2, 1);
+    mask.pixels[0] = 1;
+    mask.pixels[2] = 3;
+    GxBlender::convertBGRAToARGB(&mask);  // not a colour image: untouched
+    EXPECT_EQ(mask.pixels[0], 1);
+    EXPECT_EQ(mask.pixels[2], 3);
+}
+
+// --- clipping
+
+TEST(BlenderClip, EachEdgeEntersTheSourceAtTheRightPlace) {
+    // A 3x2 source with a row stride of 5 (0xEE is padding that must never
+    // be read), drawn into a clear 4x3 image. Source-over of an opaque colour
+    // over alpha 0 leaves alpha = m, so the alpha plane shows which source
+    // byte landed where.
+    const uint8_t src[10] = {1, 2, 3, 0xEE, 0xEE, 11, 12, 13, 0xEE, 0xEE};
+    auto run = [&](int x, int y) {
+        GxBitmap b(4, 3, 4);
+        std::memset(b.pixels, 0, 4 * 4 * 3);
+        GxBlender::drawBitmapBlend8(x, y, &b, src, 3, 2, 5, 0xFF000000, 1);
+        std::vector<int> alpha;
+        for (int i = 0; i < 12; ++i) alpha.push_back(b.pixels[i * 4 + 3]);
+        return alpha;
+    };
+    using V = std::vector<int>;
+    EXPECT_EQ(run(0, 0), (V{1, 2, 3, 0, 11, 12, 13, 0, 0, 0, 0, 0}));
+    // Negative x and y: only the bottom-right part shows, from (1, 1) on.
+    EXPECT_EQ(run(-1, -1), (V{12, 13, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0}));
+    // Right and bottom edges: the source's top-left lands in the corner.
+    EXPECT_EQ(run(3, 2), (V{0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 1}));
+    EXPECT_EQ(run(2, -1), (V{0, 0, 11, 12, 0, 0, 0, 0, 0, 0, 0, 0}));
+    // Wholly outside on every side, and placements that would overflow.
+    for (auto [x, y] : std::vector<std::pair<int, int>>{{4, 0}, {0, 3}, {-3, 0}, {0, -2}, {INT_MAX, 0},
+                                                         {0, INT_MAX}, {INT_MIN, INT_MIN}})
+        EXPECT_EQ(run(x, y), V(12, 0)) << x << "," << y;
+}
+
+TEST(BlenderClip, ImageSourcesClipLikeMasks) {
+    // 3x2 words, row length 3; alpha byte = index + 1, opaque colour 0.
+    uint32_t src[6];
+    for (int i = 0; i < 6; ++i) src[i] = uint32_t(i + 1) << 24;
+    GxBitmap b(2, 2, 4);
+    GxBlender::drawBitmapBlend32(-1, 1, &b, src, 3, 2, 3, 2);
+    EXPECT_EQ(Get(b, 0, 0)[3], 0);
+    EXPECT_EQ(Get(b, 1, 0)[3], 0);
+    EXPECT_EQ(Get(b, 0, 1)[3], 2);
+    EXPECT_EQ(Get(b, 1, 1)[3], 3);
+
+    uint8_t bytes[24] = {};
+    for (int i = 0; i < 6; ++i) bytes[i * 4 + 3] = uint8_t(i + 1);
+    GxBitmap c(2, 2, 4);
+    GxBlender::drawBitmapBlend32(1, -1, &c, bytes, 3, 2, 3, 0, 1);
+    EXPECT_EQ(Get(c, 1, 0)[3], 4);
+    EXPECT_EQ(Get(c, 0, 0)[3], 0);
+    EXPECT_EQ(Get(c, 1, 1)[3], 0);
+}
+
+TEST(BlenderClip, MissingOrMismatchedInputsAreNoOps) {
+    const uint8_t m = 255;
+    const uint32_t word = 0xFFFFFFFF;
+    GxBitmap color(1, 1, 4), mask(1, 1, 1), empty;
+    for (int mode : {1, 2, 3, 7}) {
+        GxBlender::drawBitmapBlend8(0, 0, nullptr, &m, 1, 1, 1, word, mode);
+        GxBlender::drawBitmapBlend8(0, 0, &color, nullptr, 1, 1, 1, word, mode);
+        GxBlender::drawBitmapBlend8(0, 0, &empty, &m, 1, 1, 1, word, mode);
+        GxBlender::drawBitmapBlend8(0, 0, &mask, &m, 1, 1, 1, word, mode);  // would overrun a mask
+        GxBlender::drawBitmapBlend8(0, 0, &color, &m, 0, 1, 1, word, mode);
+        GxBlender::drawBitmapBlend8(0, 0, &color, &m, 1, -1, 1, word, mode);
+    }
+    GxBlender::drawBitmapBlend32(0, 0, &mask, &word, 1, 1, 1, 1);
+    GxBlender::drawBitmap(0, 0, &color, &empty, 0);
+    EXPECT_EQ(Get(color, 0, 0), (Px{0, 0, 0, 0}));
+    EXPECT_EQ(mask.pixels[0], 0);
+}
+
+// --- properties over every input
+
+TEST(BlenderProperties, DestinationOverNeverChangesAnOpaquePixel) {
+    GxBitmap b(256, 1, 4);
+    std::vector<uint8_t> m(256);
+    std::vector<uint32_t> words(256);
+    for (int i = 0; i < 256; ++i) {
+        Set(b, i, 0, Px{i, 255 - i, i / 2, 255});
+        m[i] = uint8_t(i);
+        words[i] = uint32_t(i) * 0x01010101u;
+    }
+    std::vector<uint8_t> before(b.pixels, b.pixels + 256 * 4);
+    for (unsigned color : {0xFFFFFFFFu, 0x80402010u, 0x01FF00FFu}) {
+        for (int mode : {2, 3}) GxBlender::drawBitmapBlend8(0, 0, &b, m.data(), 256, 1, 256, color, mode);
+        // Full coverage of the text fill keeps the destination too.
+        std::vector<uint8_t> full(256, 255);
+        GxBlender::drawBitmapBlend8(0, 0, &b, full.data(), 256, 1, 256, color, 7);
+    }
+    GxBlender::drawBitmapBlend32(0, 0, &b, words.data(), 256, 1, 256, 2);
+    EXPECT_EQ(std::vector<uint8_t>(b.pixels, b.pixels + 256 * 4), before);
+}
+
+TEST(BlenderProperties, RowKernelsHandleEveryLengthWithoutTouchingNeighbours) {
+    // The shape a vectorised twin must also keep: exactly n pixels written.
+    const BlendRows::Table& t = BlendRows::Active();
+    for (int n = 1; n <= 40; ++n) {
+        std::vector<uint8_t> dst((n + 2) * 4, 0xA5), cov(n + 2, 200);
+        std::vector<uint32_t> words(n + 2, 0x80808080u);
+        uint8_t* d = dst.data() + 4;
+        t.srcOver8To32(d, cov.data(), n, 0xFF102030);
+        t.dstOver8To32(d, cov.data(), n, 0xFF102030);
+        t.dstOverSA8To32(d, cov.data(), n, 0xFF102030);
+        t.copy8To32(d, cov.data(), n, 0xFF102030);
+        t.dstOver32To32(d, words.data(), n);
+        t.srcOver32To32(d, words.data(), n);
+        t.swapRedBlue(d, n);
+        t.unpremultiply(d, n, 200);
+        for (int c = 0; c < 4; ++c) {
+            ASSERT_EQ(dst[c], 0xA5) << n;
+            ASSERT_EQ(dst[(n + 1) * 4 + c], 0xA5) << n;
+        }
+    }
+}
+
+}  // namespace
+}  // namespace Glimmer
