@@ -1,0 +1,235 @@
+#include "effect/filters/GxGlowLayer.h"
+
+#include <cstring>
+
+#include "effect/GxBlender.h"
+#include "effect/GxEffectMath.h"
+#include "effect/filters/GxColorRamp.h"
+#include "effect/filters/GxGaussian.h"
+#include "effect/filters/GxLayerSupport.h"
+
+namespace Glimmer {
+
+using EffectMath::TruncToInt;
+
+namespace {
+
+// Sizes and pass counts of one glow drawing, worked out before any pixel.
+struct GlowPlan {
+    int32_t g = 0;           // trunc(size) + 1: the frame is 2g wide on every side
+    int32_t width = 0;       // W = box width + 4g
+    int32_t height = 0;      // H = box height + 4g
+    int32_t iterations = 0;  // box filter passes
+    int32_t radius = 0;      // Gaussian radius Rg
+    size_t pixels = 0;       // W * H
+};
+
+bool PlanGlow(float size, const GxRect& box, GlowPlan* plan) {
+    const int64_t g = int64_t(TruncToInt(size)) + 1;
+    if (g <= 0) return false;
+    const int64_t w = int64_t(box.right - box.left) + 4 * g;
+    const int64_t h = int64_t(box.bottom - box.top) + 4 * g;
+    if (w > INT32_MAX || h > INT32_MAX) return false;
+    size_t bytes = 0;
+    if (!GxBitmap::PixelBytes(uint32_t(w), uint32_t(h), 4, &bytes)) return false;
+    plan->g = int32_t(g);
+    plan->width = int32_t(w);
+    plan->height = int32_t(h);
+    plan->pixels = size_t(w) * size_t(h);
+    const int32_t passes = TruncToInt(float(plan->g) * 0.475f);
+    plan->iterations = passes > 1 ? passes : 1;
+    const int32_t radius = TruncToInt(float(plan->g) * 0.9f);
+    plan->radius = radius < 0 ? 1 : radius;
+    return true;
+}
+
+// The glyph box into the middle of the plane, 2g in from every side, on a
+// frame of 0 (outer) or inverted on a frame of 255 (inner).
+void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask, const GxRect& box,
+               bool inverted) {
+    std::memset(plane, inverted ? 0xFF : 0x00, plan.pixels);
+    const int32_t inset = 2 * plan.g;
+    const size_t boxWidth = size_t(box.right - box.left);
+    for (int32_t r = 0; r < box.bottom - box.top; ++r) {
+        const unsigned char* from = mask.pixels + size_t(box.top + r) * mask.width + size_t(box.left);
+        unsigned char* to = plane + size_t(inset + r) * size_t(plan.width) + size_t(inset);
+        if (inverted) {
+            for (size_t x = 0; x < boxWidth; ++x) to[x] = uint8_t(255 - from[x]);
+        } else {
+            std::memcpy(to, from, boxWidth);
+        }
+    }
+}
+
+// Rows [Rg, H - Rg) of the image, each blurred vertically into a byte row and
+// then horizontally into colour. `frame` fills the columns the horizontal
+// pass cannot reach. `shade[v]` is the premultiplied colour of result v.
+void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& plan,
+                   const int* weights, int sum, bool inverted, const uint32_t* shade,
+                   uint32_t frame, int32_t* acc, unsigned char* row) {
+    const int32_t W = plan.width, R = plan.radius;
+    const size_t stride = size_t(W);
+    // Columns outside [R, W - R) of the byte row are never computed and read
+    // as 0 (no coverage): they lie in the frame, 2g from the glyphs. For the
+    // inner glow this matters at one place: the box filter's 0 in the plane's
+    // first and last column is not blurred back in as "inside".
+    std::memset(row, 0, stride);
+    const int32_t full = 255 * sum;
+    for (int32_t y = R; y < plan.height - R; ++y) {
+        const unsigned char* centre = plane + size_t(y) * stride;
+        for (int32_t x = R; x < W - R; ++x) acc[x] = int32_t(centre[x]) * weights[0];
+        for (int32_t i = 1; i <= R; ++i) {
+            const unsigned char* above = centre - size_t(i) * stride;
+            const unsigned char* below = centre + size_t(i) * stride;
+            const int32_t wi = weights[i];
+            for (int32_t x = R; x < W - R; ++x) acc[x] += (int32_t(above[x]) + int32_t(below[x])) * wi;
+        }
+        for (int32_t x = R; x < W - R; ++x)
+            row[x] = uint8_t(inverted ? (full - acc[x]) / sum : acc[x] / sum);
+
+        uint32_t* out = image + size_t(y) * stride;
+        // Horizontal pass, tap by tap over the whole row like the vertical
+        // one (the same integer sums, in an order that vectorises).
+        for (int32_t x = R; x < W - R; ++x) acc[x] = int32_t(row[x]) * weights[0];
+        for (int32_t i = 1; i <= R; ++i) {
+            const int32_t wi = weights[i];
+            for (int32_t x = R; x < W - R; ++x) acc[x] += (int32_t(row[x - i]) + int32_t(row[x + i])) * wi;
+        }
+        for (int32_t x = 0; x < R; ++x) out[x] = frame;
+        for (int32_t x = R; x < W - R; ++x) {
+            int32_t v = inverted ? (full - acc[x]) / sum : acc[x] / sum;
+            out[x] = shade[v < 256 ? v : 256];
+        }
+        for (int32_t x = W - R; x < W; ++x) out[x] = frame;
+    }
+    const int32_t firstUnprocessed = plan.height - R > R ? plan.height - R : R;
+    for (int32_t y = 0; y < R && y < plan.height; ++y)
+        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = frame;
+    for (int32_t y = firstUnprocessed; y < plan.height; ++y)
+        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = frame;
+}
+
+}  // namespace
+
+bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height) {
+    if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
+    const size_t w = size_t(width);
+    WorkBuffer<unsigned char> saved = AllocateWork<unsigned char>(w);
+    WorkBuffer<unsigned char> out = AllocateWork<unsigned char>(w);
+    WorkBuffer<uint16_t> columns = AllocateWork<uint16_t>(w);
+    if (!saved || !out || !columns) return false;
+    out[0] = 0;
+    out[w - 1] = 0;
+    for (int pass = 0; pass < iterations; ++pass) {
+        // `saved` holds the row above as it was before this pass rewrote it.
+        std::memcpy(saved.get(), plane, w);
+        for (int y = 1; y < height - 1; ++y) {
+            unsigned char* row = plane + size_t(y) * w;
+            const unsigned char* below = row + w;
+            for (size_t x = 0; x < w; ++x) columns[x] = uint16_t(saved[x] + row[x] + below[x]);
+            // The 3 x 3 sum is the sum of three column sums: the same integer.
+            for (size_t x = 1; x + 1 < w; ++x) {
+                unsigned s = unsigned(columns[x - 1]) + columns[x] + columns[x + 1];
+                s >>= 2;
+                out[x] = uint8_t(s > 255 ? 255 : s);
+            }
+            std::memcpy(saved.get(), row, w);
+            std::memcpy(row, out.get(), w);
+        }
+    }
+    return true;
+}
+
+void MakeGlowColorTable(uint32_t* table, const GxOuterGlowProperty* property, float fadeStart,
+                        int curve) {
+    if (property == nullptr || property->size == 0.0f) {
+        std::memset(table, 0, kColorTableSize * sizeof(uint32_t));
+        return;
+    }
+    // Null stops count as no stops, whatever the count says.
+    const int32_t count = property->stops != nullptr && property->count > 0 ? property->count : 0;
+    if (count >= 2) {
+        BuildColorRamp(table, property->stops, count, 0.0f, curve);
+    } else {
+        const uint32_t single = count == 1 ? property->stops[0].color : property->color;
+        for (int i = 0; i < kColorTableSize; ++i) table[i] = single;
+    }
+
+    // Fade: alpha falls linearly from entry k to 0 at entry 256.
+    if (fadeStart >= 1.0f) fadeStart = 0.99f;
+    if (!(fadeStart > 0.0f)) fadeStart = 0.01f;  // NaN too
+    const int k = int(double(fadeStart) * 256.0);
+    for (int j = k; j < kColorTableSize; ++j) {
+        const uint32_t factor = uint32_t(TruncToInt(float(256 - j) * 256.0f / float(256 - k)));
+        const uint32_t alpha = ((table[j] >> 24) * factor) >> 8;
+        table[j] = (table[j] & 0x00FFFFFFu) | (alpha << 24);
+    }
+    table[kColorTableSize - 1] = 0;
+}
+
+GxGlowLayer::~GxGlowLayer() { delete property; }
+
+GxProperty* GxGlowLayer::getProperty() { return property; }
+
+int32_t GxGlowLayer::getOffset() {
+    if (property == nullptr) return 0;
+    return TruncToInt(property->size + 0.5f);
+}
+
+void GxGlowLayer::makeColorLUT(unsigned int* table, float fadeStart, int curve) {
+    if (table != nullptr) MakeGlowColorTable(table, property, fadeStart, curve);
+}
+
+void GxGlowLayer::increaseByBoxFilter(unsigned char* plane, int iterations, int width, int height) {
+    GlowBoxFilter(plane, iterations, width, height);
+}
+
+void GxGlowLayer::computeGaussianWeights(int* weights, int* sum, int radius) {
+    ComputeGaussianWeights(weights, sum, radius, kGlowGaussianCentre, GaussianRounding::kDouble);
+}
+
+void GxGlowLayer::replaceProperty(GxOuterGlowProperty* copy) {
+    if (copy != nullptr && !copy->copyStops()) {
+        delete copy;
+        copy = nullptr;
+    }
+    delete property;
+    property = copy;
+}
+
+void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
+    if (p == nullptr || property == nullptr || p->textRect == nullptr || p->dst == nullptr ||
+        p->src == nullptr)
+        return;
+    GxRect box;
+    if (!ClipBoxToMask(*p->textRect, *p->src, &box)) return;
+    GlowPlan plan;
+    if (!PlanGlow(property->size, box, &plan)) return;
+    const bool inverted = side == Side::kInner;
+
+    WorkBuffer<uint32_t> image = AllocateWork<uint32_t>(plan.pixels);
+    WorkBuffer<unsigned char> plane = AllocateWork<unsigned char>(plan.pixels);
+    WorkBuffer<int> weights = AllocateWork<int>(size_t(plan.radius) + 1);
+    WorkBuffer<int32_t> acc = AllocateWork<int32_t>(size_t(plan.width));
+    WorkBuffer<unsigned char> row = AllocateWork<unsigned char>(size_t(plan.width));
+    if (!image || !plane || !weights || !acc || !row) return;
+
+    uint32_t table[kColorTableSize];
+    makeColorLUT(table, 0.3f, kRampLinear);
+    // shade[v] = premultiplied table[256 - v]; a result past 255 takes entry 0.
+    uint32_t shade[kColorTableSize];
+    for (int v = 0; v < kColorTableSize; ++v) shade[v] = PremultiplyColor(table[256 - v]);
+
+    FillPlane(plane.get(), plan, *p->src, box, inverted);
+    if (!GlowBoxFilter(plane.get(), plan.iterations, plan.width, plan.height)) return;
+
+    int sum = 0;
+    computeGaussianWeights(weights.get(), &sum, plan.radius);
+    BlurAndColour(plane.get(), image.get(), plan, weights.get(), sum, inverted, shade,
+                  inverted ? 0xFFFFFFFFu : 0u, acc.get(), row.get());
+
+    GxBlender::drawBitmapBlend32(box.left - 2 * plan.g, box.top - 2 * plan.g, p->dst, image.get(),
+                                 plan.width, plan.height, plan.width, GxE_BLEND_DST_OVER);
+}
+
+}  // namespace Glimmer
