@@ -1,0 +1,225 @@
+// Bevel
+//
+// The bevel makes the text look raised: a height field is built from the
+// distance to the glyph edge, lit by a directional light, and the lit and the
+// shaded slopes become two colour washes that are blended over the target.
+// Style 1 bevels the inside of the glyphs (the height climbs from the edge
+// inward); any other style bevels a collar outside them.
+//
+// All work happens in a private frame: the text rectangle grown by a margin
+// M = Rd + max(2 Rs, 2 soften), where, with r = int(size),
+//   smooth technique (0): Rs = ceil(2r / 3 + 1) (a real division: size 14
+//                         gives 11), Rd = Rs, colouring gain 1.83;
+//   hard technique:       Rs = 0, Rd = r + 2, gain 1.0.
+// Passes, in order:
+//  1. Light: t = (180 - angle) * 3.14159 / 180, a = altitude * 3.14159 / 180;
+//     L = (cos t cos a, sin t cos a, sin a), the first two negated when the
+//     direction is 0; normalZ = 2.4 / max(depth, 0.1).
+//  2. Height field D, saturated at Rd, one of two ways:
+//     - exact (smooth and Rd >= 11): the glyph pixels are far (inside style)
+//       or zero (outside style), everything else the opposite; the squared
+//       Euclidean transform runs down the columns, then along the rows; values
+//       become 0, fsqrt(v), or Rd beyond Rd^2. The glyph test covers the text
+//       rectangle plus one column and one row past its right and bottom edges,
+//       deliberately (those read the mask as a packed buffer would).
+//     - local search: coverage becomes an edge fraction (byte / 254.99), the
+//       anti-aliased edge pixels keep 1 - f, and every other pixel takes the
+//       nearest v + sqrt(dx^2 + dy^2) within Rd (GxRelief's local search).
+//  3. Lighting of every pixel but the frame's outer ring: flat pixels (D = Rd
+//     exactly) are skipped; the slope (central differences) gives a level
+//     0..255, taken as is inside and as 255 - level outside, and the two
+//     planes receive alpha-scaled amounts faded by the edge factor of Rd - D.
+//     The scalings are deliberately asymmetric: int(V + 1) for the second
+//     plane, 256 - int(V) for the first.
+//  4. Smooth technique: both planes blurred with Rs; soften >= 1: blurred
+//     again with soften; the buffers rotate as GxRelief describes, outer
+//     strips included.
+//  5. Colouring: the stronger wash (after the gain, truncated) wins; the pixel
+//     is its colour premultiplied by the difference, at most 255; a tie takes
+//     the second colour with alpha 0. Flat regions fill both planes alike and
+//     cancel here.
+//  6. The frame is blended into the destination with mode 1 in the separate-
+//     work-image mode and mode 2 otherwise.
+// The first colour is the record's highlight colour, the second its shadow
+// colour; only their alpha and colour bytes are used (the float opacities are
+// already folded into them by the stack).
+
+#include "effect/filters/GxBevel.h"
+
+#include <cmath>
+#include <cstdlib>
+#include <new>
+
+#include "effect/GxEffectMath.h"
+#include "effect/filters/GxSqrt.h"
+
+namespace Glimmer {
+namespace {
+
+constexpr float kFar = 1e20f;  // bits 0x60AD78EC
+constexpr int kExactFromRange = 11;
+
+}  // namespace
+
+GxBevel::GxBevel() { style = GxECore::kBevel; }
+
+GxBevel::~GxBevel() { delete property; }
+
+void GxBevel::setProperty(GxProperty* p) {
+    if (p == nullptr) return;
+    const auto* source = dynamic_cast<const GxBevelProperty*>(p);
+    if (source == nullptr) return;
+    auto* fresh = new (std::nothrow) GxBevelProperty(
+        source->style, source->depth, source->size, source->direction, source->technique,
+        source->soften, source->opacity, source->angle, source->altitude, source->highlightColor,
+        source->highlightOpacity, source->shadowColor, source->shadowOpacity);
+    delete property;
+    property = fresh;
+}
+
+GxProperty* GxBevel::getProperty() { return property; }
+
+int32_t GxBevel::getOffset() {
+    int pixels = 0;
+    if (property == nullptr || !ReliefSizePixels(property->size, &pixels)) return 0;
+    return ReliefSoften(property->soften) + EffectMath::TruncToInt(property->size + 0.5f);
+}
+
+GxBevelGeometry GxBevel::geometry(const GxBevelProperty& property) {
+    GxBevelGeometry g;
+    if (!ReliefSizePixels(property.size, &g.size)) return g;
+    g.drawable = true;
+    g.soften = ReliefSoften(property.soften);
+    const bool smooth = property.technique == 0;
+    g.smoothRadius = smooth ? int(std::ceil(float(2 * g.size) / 3.0f + 1.0f)) : 0;
+    g.range = smooth ? g.smoothRadius : g.size + 2;
+    const int spread = 2 * g.smoothRadius > 2 * g.soften ? 2 * g.smoothRadius : 2 * g.soften;
+    g.margin = g.range + spread;
+    g.exact = smooth && g.range >= kExactFromRange;
+    g.gain = smooth ? kBevelVariant.smoothGain : 1.0f;
+    return g;
+}
+
+int GxBevel::blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height) {
+    return ReliefBlur(src, dst, stride, radius, height);
+}
+
+void GxBevel::dt1D(const float* f, float* d, int n) { ReliefDT1D(f, d, n); }
+
+int GxBevel::partialBlur(void* job) { return ReliefPartialBlur(job); }
+
+int GxBevel::partialDT(void* raw) {
+    auto* job = static_cast<DistanceJob*>(raw);
+    if (job == nullptr) return 0;
+    return ReliefLocalDistance(job->field, job->width, job->height, job->radius, job->y0, job->y1,
+                               GxReliefTargets::kNonZero);
+}
+
+int GxBevel::partialLightProcess(void* raw) {
+    auto* job = static_cast<LightJob*>(raw);
+    if (job == nullptr || job->field == nullptr) return 0;
+    const GxReliefLight light{job->lightX, job->lightY, job->lightZ};
+    const float range = float(job->range);
+    const ptrdiff_t stride = job->stride;
+    for (int y = job->y0; y < job->y1; ++y) {
+        for (int x = job->x0; x < job->x1; ++x) {
+            const ptrdiff_t i = ptrdiff_t(y) * stride + x;
+            const float* d = job->field + i;
+            if (*d == range) continue;  // flat top or flat ground
+            const float gx = (d[-1] - d[1]) * 0.5f;
+            const float gy = (d[-stride] - d[stride]) * 0.5f;
+            const float level = ReliefClampLevel(ReliefIncidence(light, job->normalZ, gx, gy) * 255.0f);
+            const float v = job->inside ? level : float(255 - int(level));
+            const int edge = ReliefEdgeFactor(range - *d);
+            job->secondPlane[i] = ReliefPlaneValue(job->secondAlpha * int(v + 1.0f), edge);
+            job->firstPlane[i] = ReliefPlaneValue((256 - int(v)) * job->firstAlpha, edge);
+        }
+    }
+    return 0;
+}
+
+void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
+    if (property == nullptr || pp == nullptr || pp->dst == nullptr || pp->src == nullptr ||
+        pp->src->pixels == nullptr || pp->textRect == nullptr) {
+        return;
+    }
+    const GxBevelProperty& prop = *property;
+    const GxBevelGeometry g = geometry(prop);
+    if (!g.drawable) return;
+
+    const GxReliefLight light = ReliefLightVector(prop.angle, prop.altitude, prop.direction);
+    const float normalZ = ReliefNormalZ(prop.depth, kBevelVariant.depthFloor);
+
+    const GxRect& text = *pp->textRect;
+    GxReliefFrame frame;
+    if (!ReliefPlanFrame(text, g.margin, &frame)) return;
+    const int W = frame.width;
+    const int H = frame.height;
+    const int M = frame.margin;
+    const size_t stride = size_t(W);
+
+    float* field = static_cast<float*>(std::malloc(sizeof(float) * frame.pixels));
+    GxReliefPlanes planes;
+    if (field == nullptr || !planes.Allocate(frame.pixels)) {
+        std::free(field);
+        return;
+    }
+
+    const bool inside = prop.style == 1;
+    const GxBitmap& mask = *pp->src;
+    if (g.exact) {
+        const float glyphValue = inside ? kFar : 0.0f;
+        const float otherValue = inside ? 0.0f : kFar;
+        for (int y = 0; y < H; ++y) {
+            float* row = field + size_t(y) * stride;
+            const bool rowInWindow = y >= M && y <= H - M;
+            for (int x = 0; x < W; ++x) {
+                const bool glyph = rowInWindow && x >= M && x <= W - M &&
+                                   ReliefMaskAt(mask, int64_t(frame.x0) + x, int64_t(frame.y0) + y) != 0;
+                row[x] = glyph ? glyphValue : otherValue;
+            }
+        }
+        if (!ReliefExactTransform(field, W, H)) {
+            std::free(field);
+            return;
+        }
+        const float rangeSquared = float(int64_t(g.range) * g.range);
+        for (size_t i = 0; i < frame.pixels; ++i) {
+            const float v = field[i];
+            field[i] = v <= 0.0f ? 0.0f : (v > rangeSquared ? float(g.range) : fsqrt(v));
+        }
+    } else {
+        const float fill = inside ? 0.0f : float(g.range);
+        for (size_t i = 0; i < frame.pixels; ++i) field[i] = fill;
+        const int textWidth = text.right - text.left;
+        const int textHeight = text.bottom - text.top;
+        for (int j = 0; j < textHeight; ++j) {
+            float* row = field + size_t(M + j) * stride + size_t(M);
+            for (int i = 0; i < textWidth; ++i) {
+                unsigned m = ReliefMaskAt(mask, int64_t(text.left) + i, int64_t(text.top) + j);
+                if (inside) m ^= 255;
+                const float f = float(m) / kBevelVariant.coverageScale;
+                row[i] = f <= 0.001f ? float(g.range) : (f < 1.0f ? 1.0f - f : 0.0f);
+            }
+        }
+        DistanceJob job{field, H, W, g.range, 0, H};
+        partialDT(&job);
+    }
+
+    LightJob lightJob{planes.second, planes.first, W, g.range, normalZ, light.x, light.y, light.z,
+                      int(prop.shadowColor >> 24), int(prop.highlightColor >> 24), inside, field,
+                      1, W - 1, 1, H - 1};
+    partialLightProcess(&lightJob);
+    std::free(field);
+
+    if (!ReliefSmoothAndSoften(&planes, W, H, g.smoothRadius, g.soften)) return;
+
+    auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
+    if (argb == nullptr) return;
+    ReliefColourise(planes.first, planes.second, frame.pixels, g.gain, prop.highlightColor,
+                    prop.shadowColor, argb);
+    ReliefDrawFrame(kBevelVariant, frame, argb, pp->separateWorkImage, pp->dst, pp->extraDst);
+    std::free(argb);
+}
+
+}  // namespace Glimmer

@@ -1,0 +1,79 @@
+#pragma once
+// The bevel layer (kind 5): the glyphs look raised, lit from one direction.
+// The algorithm is described at the top of GxBevel.cpp; the pieces it shares
+// with the emboss layer are in GxRelief.h.
+
+#include <cstdint>
+
+#include "effect/GxECoreBase.h"
+#include "effect/GxProperty.h"
+#include "effect/filters/GxRelief.h"
+
+namespace Glimmer {
+
+// Everything a bevel derives from its property before touching a pixel.
+struct GxBevelGeometry {
+    bool drawable = false;  // false when the size is too large for any frame
+    int size = 0;           // r = int(size), at least 0
+    int smoothRadius = 0;   // Rs: ceil(2r / 3 + 1) for the smooth technique, else 0
+    int range = 0;          // Rd: Rs for the smooth technique, r + 2 for the hard one
+    int soften = 0;
+    int margin = 0;         // Rd + max(2 Rs, 2 soften)
+    bool exact = false;     // exact distance transform (smooth and Rd >= 11), else local search
+    float gain = 1.0f;      // colouring gain: 1.83 smooth, 1.0 hard
+};
+
+class GxBevel : public GxECoreBase {
+public:
+    using BlurJob = GxReliefBlurJob;
+
+    // The local search over rows [y0, y1) of a width x height field.
+    struct DistanceJob {
+        float* field;
+        int height;
+        int width;
+        int radius;
+        int y0, y1;
+    };
+
+    // Lighting of the region [x0, x1) x [y0, y1) (one pixel inside the frame).
+    struct LightJob {
+        unsigned char* secondPlane;
+        unsigned char* firstPlane;
+        int stride;
+        int range;
+        float normalZ;
+        float lightX, lightY, lightZ;
+        int secondAlpha;
+        int firstAlpha;
+        bool inside;
+        const float* field;
+        int x0, x1;
+        int y0, y1;
+    };
+
+    GxBevel();
+    ~GxBevel() override;
+
+    void doPostProcessing(GxECore::ParamPostProcessing* pp) override;
+    // Keeps a fresh record built through the record's constructor (its clamps
+    // and folds apply again); null and non-bevel records are ignored.
+    void setProperty(GxProperty* p) override;
+    GxProperty* getProperty() override;
+    // soften + int(size + 0.5); 0 without a property or past the radius limit.
+    int32_t getOffset() override;
+
+    static GxBevelGeometry geometry(const GxBevelProperty& property);
+
+    static int blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height);
+    static void dt1D(const float* f, float* d, int n);
+    // Work functions: one job record each, return 0.
+    static int partialBlur(void* job);
+    static int partialDT(void* job);
+    static int partialLightProcess(void* job);
+
+private:
+    GxBevelProperty* property = nullptr;
+};
+
+}  // namespace Glimmer

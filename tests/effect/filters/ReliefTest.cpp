@@ -1,0 +1,371 @@
+// The pieces bevel and emboss share (blur, distance transforms, the local
+// search against its literal scan, light, edge factor, plane writes,
+// colouring, plane rotation), then properties both layers must have.
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <random>
+#include <vector>
+
+#include "ReliefTestSupport.h"
+#include "effect/filters/GxBevel.h"
+#include "effect/filters/GxEmboss.h"
+#include "effect/filters/GxRelief.h"
+#include "effect/filters/GxSqrt.h"
+
+namespace Glimmer {
+namespace {
+
+using namespace Testing;
+constexpr float kFar = 1e20f;
+
+TEST(ReliefKernels, BlurByHandAndAgainstTheFormula) {
+    // Radius 1: weights 100 and 1, total 102. One 255 pixel: vertical 250 at
+    // the centre and 2 above and below; horizontal 245 at the centre, 2 beside,
+    // 1 above and below. Nothing outside [1, 4) x [1, 4) is written.
+    std::vector<uint8_t> src(25, 0), dst(25, 0xAB);
+    src[12] = 255;
+    ASSERT_EQ(ReliefBlur(src.data(), dst.data(), 5, 1, 5), 0);
+    const std::vector<uint8_t> want = {171, 171, 171, 171, 171, 171, 0, 1, 0, 171, 171, 2, 245,
+                                       2,   171, 171, 0,   1,   0,   171, 171, 171, 171, 171, 171};
+    EXPECT_EQ(dst, want);
+
+    std::mt19937 rng(7);
+    for (int r : {2, 5, 16}) {
+        const int w = 2 * r + 9, h = 2 * r + 6;
+        std::vector<uint8_t> in(size_t(w) * h), out(in.size(), 0), ref(in.size(), 0);
+        for (auto& v : in) v = uint8_t(rng() % 4 == 0 ? 255 : rng() % 256);
+        ReliefBlur(in.data(), out.data(), w, r, h);
+        std::vector<int> wt(r + 1, 100);
+        int total = 100;
+        for (int i = 1; i <= r; ++i) {
+            wt[i] = int(std::exp(float(-(i * i)) / (float(r * r) / 4.60517f)) * 100.0f + 0.5f);
+            total += 2 * wt[i];
+        }
+        for (int y = r; y < h - r; ++y) {
+            std::vector<int> row(w, 0);
+            for (int x = r; x < w - r; ++x) {
+                int acc = 100 * in[y * w + x];
+                for (int i = 1; i <= r; ++i) acc += wt[i] * (in[(y - i) * w + x] + in[(y + i) * w + x]);
+                row[x] = acc / total;
+            }
+            for (int x = r; x < w - r; ++x) {
+                int acc = 100 * row[x];
+                for (int i = 1; i <= r; ++i) acc += wt[i] * (row[x - i] + row[x + i]);
+                ref[y * w + x] = uint8_t(std::min(acc / total, 255));
+            }
+        }
+        EXPECT_EQ(out, ref) << "radius " << r;
+    }
+}
+
+TEST(ReliefKernels, DistanceTransformsAgainstBruteForce) {
+    std::mt19937 rng(11);
+    const float values[] = {0.0f, kFar, 1.0f, 4.0f, 0.25f, 9.5f, 30.0f};
+    for (int n = 1; n <= 12; ++n) {
+        for (int trial = 0; trial < 200; ++trial) {
+            std::vector<float> f(n), d(n, -1.0f);
+            for (float& v : f) v = values[rng() % 7];
+            ReliefDT1D(f.data(), d.data(), n);
+            for (int p = 0; p < n; ++p) {
+                float best = kFar * 4;
+                for (int q = 0; q < n; ++q) best = std::min(best, f[q] + float((p - q) * (p - q)));
+                ASSERT_EQ(d[p], best) << "n " << n << " p " << p;
+            }
+        }
+    }
+    const int w = 17, h = 11;
+    std::vector<float> field(w * h);
+    for (float& v : field) v = rng() % 9 == 0 ? 0.0f : kFar;
+    const std::vector<float> seeds = field;
+    ASSERT_TRUE(ReliefExactTransform(field.data(), w, h));
+    for (int y = 0; y < h; ++y) {
+        for (int x = 0; x < w; ++x) {
+            float best = kFar;
+            for (int j = 0; j < h; ++j)
+                for (int i = 0; i < w; ++i)
+                    if (seeds[j * w + i] == 0.0f) best = std::min(best, float((x - i) * (x - i) + (y - j) * (y - j)));
+            ASSERT_EQ(field[y * w + x], best) << x << "," << y;
+        }
+    }
+}
+
+TEST(ReliefKernels, LocalSearchAgreesBitForBitWithTheLiteralScan) {
+    std::mt19937 rng(5);
+    // Fields shaped like the filters': a flat range, edge fractions, zeros,
+    // and (for the outward pass, and once to force the fallback) negatives.
+    auto randomField = [&](int w, int h, float range, bool negatives) {
+        std::vector<float> f(size_t(w) * h);
+        for (float& v : f) {
+            const unsigned r = rng() % 10;
+            v = r < 6 ? range : r < 8 ? 1.0f - float(1 + rng() % 254) / 254.99f
+                : (r < 9 || !negatives) ? 0.0f : -float(rng() % 4);
+        }
+        return f;
+    };
+    struct Case { int w, h, radius, y0, y1; };
+    for (Case c : {Case{9, 7, 3, 0, 7}, Case{20, 13, 5, 4, 9}, Case{31, 5, 12, 1, 5}, Case{6, 6, 40, 0, 6},
+                   Case{16, 16, 0, 0, 16}, Case{40, 30, 9, 10, 11}}) {
+        for (GxReliefTargets t : {GxReliefTargets::kNonZero, GxReliefTargets::kPositive}) {
+            for (int trial = 0; trial < 4; ++trial) {
+                std::vector<float> fast = randomField(c.w, c.h, float(c.radius), t == GxReliefTargets::kPositive || trial == 3);
+                std::vector<float> slow = fast;
+                ReliefLocalDistance(fast.data(), c.w, c.h, c.radius, c.y0, c.y1, t);
+                ReliefLocalDistanceReference(slow.data(), c.w, c.h, c.radius, c.y0, c.y1, t);
+                ASSERT_EQ(std::memcmp(fast.data(), slow.data(), fast.size() * sizeof(float)), 0)
+                    << c.w << "x" << c.h << " r" << c.radius;
+            }
+        }
+    }
+    // One source in a 60 x 60 corner: the far corner is at index 6962, past
+    // the root table's 5490 entries, and gets sqrt(6962) to three places.
+    std::vector<float> fast(3600, 100.0f);
+    fast[0] = 0.0f;
+    std::vector<float> slow = fast;
+    ReliefLocalDistance(fast.data(), 60, 60, 60, 0, 60, GxReliefTargets::kNonZero);
+    ReliefLocalDistanceReference(slow.data(), 60, 60, 60, 0, 60, GxReliefTargets::kNonZero);
+    EXPECT_EQ(fast, slow);
+    EXPECT_EQ(fast[3599], 83.439f);
+    GxReliefRoots roots(2 * 130 * 130);
+    for (int i = 0; i < 2 * 130 * 130; i += 13) ASSERT_EQ(roots[i], IntSqrt(i)) << i;
+}
+
+TEST(ReliefKernels, LightVectorForAngleAndAltitudePairs) {
+    GxReliefLight l = ReliefLightVector(180.0f, 0.0f, 1);  // t = a = 0: along +x
+    EXPECT_TRUE(l.x == 1.0f && l.y == 0.0f && l.z == 0.0f);
+    l = ReliefLightVector(180.0f, 0.0f, 0);  // direction 0 negates x and y only
+    EXPECT_TRUE(l.x == -1.0f && l.z == 0.0f);
+    l = ReliefLightVector(0.0f, 0.0f, 1);  // t = 3.14159, short of pi: y keeps a rest
+    EXPECT_EQ(l.x, -1.0f);
+    EXPECT_TRUE(l.y > 2e-6f && l.y < 3e-6f);
+    EXPECT_NEAR(ReliefLightVector(90.0f, 0.0f, 1).y, 1.0f, 1e-6f);
+    EXPECT_NEAR(ReliefLightVector(270.0f, 0.0f, 1).y, -1.0f, 1e-6f);
+    l = ReliefLightVector(135.0f, 30.0f, 0);
+    EXPECT_NEAR(l.x, -0.70711f * 0.86603f, 1e-4f);
+    EXPECT_NEAR(l.y, -0.70711f * 0.86603f, 1e-4f);
+    EXPECT_NEAR(l.z, 0.5f, 1e-5f);
+    EXPECT_EQ(ReliefNormalZ(0.0f, kBevelVariant.depthFloor), 2.4f / 0.1f);
+    EXPECT_EQ(ReliefNormalZ(0.0f, kEmbossVariant.depthFloor), 2.4f / 0.2f);
+}
+
+TEST(ReliefKernels, LevelEdgeFactorPlaneWriteAndColouring) {
+    EXPECT_EQ(ReliefClampLevel(300.0f), 255.0f);
+    EXPECT_EQ(ReliefClampLevel(NAN), 0.0f);
+    EXPECT_EQ(ReliefEdgeFactor(0.5f), 128);  // 127.5 + 0.5
+    EXPECT_EQ(ReliefEdgeFactor(1.0f), 255);  // 255.5 capped
+    EXPECT_EQ(ReliefEdgeFactor(-2.0f), 0);
+    EXPECT_EQ(ReliefEdgeFactor(NAN), 0);
+    EXPECT_EQ(ReliefPlaneValue(0, 255), 0);            // (0 + 1) * 255 >> 8
+    EXPECT_EQ(ReliefPlaneValue(255 * 53, 128), 26);    // (52 + 1) * 128 >> 8
+    EXPECT_EQ(ReliefPlaneValue(256 * 257, 255), 255);  // 258 * 255 reaches 65536
+    EXPECT_EQ(ReliefPlaneValue(-4096, 255), 0);
+
+    // The stronger wash after the gain (truncated) wins; a tie takes the
+    // second colour, at alpha 0.
+    EXPECT_FALSE(ReliefTone(10, 10, 1.83f).first);
+    const uint8_t first[] = {200, 0, 1, 3};
+    const uint8_t second[] = {0, 100, 1, 2};
+    uint32_t out[4];
+    ReliefColourise(first, second, 4, 1.83f, 0xFF336699, 0x00FFFFFF, out);
+    EXPECT_EQ(out[0], 0xFF336699u);  // 366 capped at 255: the colour as it is
+    EXPECT_EQ(out[1], 0xB7B7B7B7u);  // 183 in the second colour; its own alpha is not read
+    EXPECT_EQ(out[2], 0u);           // tie
+    EXPECT_EQ(out[3], 0x02000001u);  // int(5.49) - int(3.66) = 2: blue (153 + 1) * 2 >> 8
+}
+
+TEST(ReliefKernels, BlursRotateThePlanesAndKeepOuterStrips) {
+    // 7 x 7 planes, second all 30, first all 90, radius 1 blurs: the outer
+    // ring is never written, so it shows which buffer went where.
+    auto ringOf = [](const uint8_t* p) {
+        std::vector<uint8_t> r;
+        for (int i = 0; i < 7; ++i) r.insert(r.end(), {p[i], p[42 + i], p[i * 7], p[i * 7 + 6]});
+        return std::all_of(r.begin(), r.end(), [&](uint8_t v) { return v == r[0]; }) ? int(r[0]) : -1;
+    };
+    struct Case { int smooth, soften, secondRing, firstRing; };
+    for (Case c : {Case{1, 0, 0, 30}, Case{1, 1, 90, 0}, Case{0, 1, 0, 30}}) {
+        GxReliefPlanes p;
+        ASSERT_TRUE(p.Allocate(49));
+        std::memset(p.second, 30, 49);
+        std::memset(p.first, 90, 49);
+        ASSERT_TRUE(ReliefSmoothAndSoften(&p, 7, 7, c.smooth, c.soften));
+        EXPECT_EQ(ringOf(p.second), c.secondRing) << c.smooth << c.soften;
+        EXPECT_EQ(ringOf(p.first), c.firstRing) << c.smooth << c.soften;
+    }
+}
+
+TEST(ReliefKernels, FramesAndSizes) {
+    GxReliefFrame f;
+    ASSERT_TRUE(ReliefPlanFrame(GxRect(10, 20, 10, 20), 4, &f));  // empty text: 2M x 2M
+    EXPECT_TRUE(f.width == 8 && f.height == 8 && f.x0 == 6 && f.y0 == 16);
+    EXPECT_FALSE(ReliefPlanFrame(GxRect(0, 0, 100, 100), 40000, &f));
+    int r = -1;
+    EXPECT_TRUE(ReliefSizePixels(-3.0f, &r) && r == 0);
+    EXPECT_TRUE(ReliefSizePixels(NAN, &r) && r == 0);
+    EXPECT_TRUE(ReliefSizePixels(14.9f, &r) && r == 14);
+    EXPECT_TRUE(ReliefSizePixels(1024.9f, &r) && r == 1024);
+    EXPECT_FALSE(ReliefSizePixels(1025.0f, &r));  // the filters' radius limit
+    EXPECT_FALSE(ReliefSizePixels(1e30f, &r));
+}
+
+// ---- properties of both layers
+
+struct BevelKind {
+    using Layer = GxBevel;
+    using Record = GxBevelProperty;
+    static int Margin(const ReliefParams& p) { return GxBevel::geometry(MakeRecord<Record>(p)).margin; }
+    // Outside this many pixels from the edge the field is flat. The bevel has
+    // one flat side: the ground of an outer bevel, the top of an inner one.
+    static int Reach(const ReliefParams& p) {
+        const GxBevelGeometry g = GxBevel::geometry(MakeRecord<Record>(p));
+        return g.range + g.smoothRadius + g.soften + 1;
+    }
+    static bool FlatOutside(const ReliefParams& p) { return p.style != 1; }
+    static bool FlatInside(const ReliefParams& p) { return p.style == 1; }
+    static std::vector<ReliefParams> Cases() {
+        return {Relief(1, 0, 3), Relief(0, 1, 6, 4), Relief(1, 0, 15), Relief(0, 0, 15, 4)};
+    }
+    static ReliefParams Largest() { return Relief(0, 1, 120, 16); }  // windows to 2 * 122^2
+};
+
+struct EmbossKind {
+    using Layer = GxEmboss;
+    using Record = GxEmbossProperty;
+    static int Margin(const ReliefParams& p) { return GxEmboss::geometry(MakeRecord<Record>(p)).margin; }
+    static int Reach(const ReliefParams& p) {
+        const GxEmbossGeometry g = GxEmboss::geometry(MakeRecord<Record>(p));
+        return g.outRange + g.smoothRadius + g.soften + 1;
+    }
+    static bool FlatOutside(const ReliefParams&) { return true; }
+    static bool FlatInside(const ReliefParams&) { return true; }
+    static std::vector<ReliefParams> Cases() {
+        return {Relief(0, 1, 6), Relief(1, 1, 12, 3), Relief(0, 0, 9, 2), Relief(0, 0, 26, 4)};
+    }
+    static ReliefParams Largest() { return Relief(0, 1, 130, 16); }  // windows to 2 * 68^2
+};
+
+template <typename Kind>
+class ReliefLayer : public ::testing::Test {
+protected:
+    using Layer = typename Kind::Layer;
+    using Record = typename Kind::Record;
+    static void Run(ReliefCanvas& c, const ReliefParams& p, int separate = 0, GxBitmap* extra = nullptr) {
+        c.template Run<Layer, Record>(p, separate, extra);
+    }
+};
+using ReliefKinds = ::testing::Types<BevelKind, EmbossKind>;
+TYPED_TEST_SUITE(ReliefLayer, ReliefKinds);
+
+// Direction 0 negates the horizontal light: on a mask symmetric under a half
+// turn the picture turns half round, byte for byte, so the colours swap sides.
+TYPED_TEST(ReliefLayer, DirectionZeroTurnsThePictureHalfRound) {
+    std::vector<ReliefParams> cases = TypeParam::Cases();
+    cases.push_back(TypeParam::Largest());  // past the root table: proves the reads under ASan
+    for (ReliefParams p : cases) {
+        const bool largest = p.size > 100;
+        ReliefCanvas up(largest ? 5 : 15, largest ? 5 : 13, TypeParam::Margin(p) + 1);
+        up.FillPointSymmetric(5 + p.soften);
+        ReliefCanvas down = up;
+        this->Run(up, p);
+        p.direction = 0;
+        this->Run(down, p);
+        EXPECT_GT(up.DrawnPixels(), largest ? 1000 : 50);
+        EXPECT_TRUE(HalfTurnOf(up.dst, down.dst)) << "style " << p.style << " size " << p.size;
+    }
+}
+
+TYPED_TEST(ReliefLayer, TransparentColoursDrawNothingAndOneShowsOnlyTheOther) {
+    std::mt19937 rng(9);
+    for (ReliefParams p : TypeParam::Cases()) {
+        p.first &= 0x00FFFFFF;
+        p.second &= 0x00FFFFFF;
+        for (int separate : {0, 1}) {
+            ReliefCanvas c(10, 8, TypeParam::Margin(p));
+            c.FillPointSymmetric(3);
+            for (size_t i = 0; i < c.DstBytes(); ++i) c.dst.pixels[i] = uint8_t(rng());
+            GxBitmap before(c.dst), extra(c.dst);
+            this->Run(c, p, separate, &extra);
+            EXPECT_TRUE(SamePixels(before, c.dst) && SamePixels(before, extra)) << p.size << separate;
+        }
+    }
+    // Each plane is scaled by its own colour's alpha.
+    for (bool firstTransparent : {true, false}) {
+        ReliefParams p = TypeParam::Cases()[1];
+        (firstTransparent ? p.first : p.second) &= 0x00FFFFFF;
+        ReliefCanvas c(10, 10, TypeParam::Margin(p));
+        c.FillSquare(2);
+        this->Run(c, p);
+        int red = 0, blue = 0;
+        for (size_t i = 0; i < c.DstBytes(); i += 4) {
+            red += c.dst.pixels[i] != 0;
+            blue += c.dst.pixels[i + 2] != 0;
+        }
+        EXPECT_EQ(red == 0, firstTransparent);
+        EXPECT_EQ(blue == 0, !firstTransparent);
+        EXPECT_GT(red + blue, 20);
+    }
+}
+
+TYPED_TEST(ReliefLayer, FlatRegionsProduceNothing) {
+    for (ReliefParams p : TypeParam::Cases()) {
+        const int reach = TypeParam::Reach(p);
+        ReliefCanvas c(2 * reach + 20, 2 * reach + 20, TypeParam::Margin(p) + 2);
+        c.FillSquare(4);
+        this->Run(c, p);
+        const int lo = c.rect.left + 4, hi = c.rect.right - 4;  // full coverage on [lo, hi)
+        int flatSeen = 0, flatDrawn = 0;
+        for (int y = 0; y < int(c.dst.height); ++y) {
+            for (int x = 0; x < int(c.dst.width); ++x) {
+                const int out = std::max({lo - x, x - hi + 1, lo - y, y - hi + 1});
+                const bool flat = (out > reach && TypeParam::FlatOutside(p)) ||
+                                  (-out > reach && TypeParam::FlatInside(p));
+                flatSeen += flat;
+                flatDrawn += flat && c.Pixel(x, y)[3] != 0;
+            }
+        }
+        EXPECT_GT(c.DrawnPixels(), 100);
+        EXPECT_GE(flatSeen, 100);
+        EXPECT_EQ(flatDrawn, 0) << "style " << p.style << " size " << p.size;
+    }
+}
+
+TYPED_TEST(ReliefLayer, MissingAndExtremeInputIsClean) {
+    ReliefCanvas c(6, 5, 3);
+    c.FillSquare(1);
+    typename TypeParam::Layer bare;
+    GxECore::ParamPostProcessing pp{&c.dst, &c.mask, &c.rect, 0, nullptr};
+    bare.doPostProcessing(&pp);  // no property
+    EXPECT_EQ(bare.getOffset(), 0);
+    typename TypeParam::Record record = MakeRecord<typename TypeParam::Record>(TypeParam::Cases()[0]);
+    bare.setProperty(&record);
+    bare.doPostProcessing(nullptr);
+    pp.src = nullptr;
+    bare.doPostProcessing(&pp);
+    EXPECT_EQ(c.DrawnPixels(), 0);
+
+    for (ReliefParams p : TypeParam::Cases()) {
+        ReliefCanvas edge(8, 8, 0);  // text against every canvas edge (the exact
+        edge.FillSquare(0);          // transform reads one column and row further)
+        this->Run(edge, p);
+        EXPECT_GT(edge.DrawnPixels(), 0);
+        ReliefCanvas empty(0, 0, TypeParam::Margin(p));  // a 2M x 2M frame
+        this->Run(empty, p);
+    }
+    for (float size : {1e9f, INFINITY, NAN, -50.0f}) {
+        ReliefParams p = Relief(0, 1, size);
+        ReliefCanvas t(6, 5, 3);
+        t.FillSquare(1);
+        this->Run(t, p);
+        EXPECT_EQ(t.DrawnPixels() > 0, !(size > 1e6f)) << size;  // NaN and negatives act as 0
+        typename TypeParam::Record huge = MakeRecord<typename TypeParam::Record>(p);
+        bare.setProperty(&huge);
+        if (size > 1e6f) {
+            EXPECT_EQ(bare.getOffset(), 0);  // past the radius limit: no margin either
+        }
+    }
+}
+
+}  // namespace
+}  // namespace Glimmer
