@@ -9,9 +9,7 @@
 // - bevel and emboss colours carry their opacity, and the layer opacity, in
 //   their alpha byte (those filters read only the alpha bytes);
 // - "highlight" is the colour of the slopes that face the light on a raised
-//   glyph, "shadow" that of the others; both filters paint their second colour
-//   record field on the lit side, so highlight goes there (against the
-//   fields' names).
+//   glyph, "shadow" that of the others, as the records name them.
 
 #include "Effects.h"
 
@@ -411,17 +409,16 @@ void ApplyEffect(const EffectRequest& effect, GxTextObject* text) {
             const float layer = number("opacity");
             const uint32_t highlight = WithAlpha(color("highlight"), number("highlight-opacity") * Unit(layer));
             const uint32_t shadow = WithAlpha(color("shadow"), number("shadow-opacity") * Unit(layer));
-            // Both filters paint their second colour where a raised relief faces the light.
             if (e.spec->kind == GxECore::kBevel) {
                 id = stack->addBevelText(choice("style"), number("depth"), number("size"), choice("direction"),
                                          choice("technique"), WholeNumber(number("soften")), layer,
-                                         number("angle"), number("altitude"), shadow, number("shadow-opacity"),
-                                         highlight, number("highlight-opacity"));
+                                         number("angle"), number("altitude"), highlight, number("highlight-opacity"),
+                                         shadow, number("shadow-opacity"));
             } else {
                 id = stack->addEmbossText(choice("style"), number("depth"), number("size"), choice("direction"),
                                           choice("technique"), WholeNumber(number("soften")), layer,
-                                          number("angle"), number("altitude"), shadow, number("shadow-opacity"),
-                                          highlight, number("highlight-opacity"));
+                                          number("angle"), number("altitude"), highlight, number("highlight-opacity"),
+                                          shadow, number("shadow-opacity"));
             }
             break;
         }

@@ -207,7 +207,7 @@ void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
     }
 
     LightJob lightJob{planes.second, planes.first, W, g.range, normalZ, light.x, light.y, light.z,
-                      int(prop.shadowColor >> 24), int(prop.highlightColor >> 24), inside, field,
+                      int(ReliefSecondColour(prop) >> 24), int(ReliefFirstColour(prop) >> 24), inside, field,
                       1, W - 1, 1, H - 1};
     partialLightProcess(&lightJob);
     std::free(field);
@@ -216,8 +216,8 @@ void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
 
     auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
     if (argb == nullptr) return;
-    ReliefColourise(planes.first, planes.second, frame.pixels, g.gain, prop.highlightColor,
-                    prop.shadowColor, argb);
+    ReliefColourise(planes.first, planes.second, frame.pixels, g.gain, ReliefFirstColour(prop),
+                    ReliefSecondColour(prop), argb);
     ReliefDrawFrame(kBevelVariant, frame, argb, pp->separateWorkImage, pp->dst, pp->extraDst);
     std::free(argb);
 }

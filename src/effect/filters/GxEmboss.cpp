@@ -275,8 +275,8 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
 
     const GxBitmap& mask = *pp->src;
     LightJob job{normal.second, normal.first, nullptr, nullptr, W, g.outRange, g.inRange, normalZ,
-                 light.x, light.y, light.z, int(prop.shadowColor >> 24),
-                 int(prop.highlightColor >> 24), 1, W - 1, 1, H - 1};
+                 light.x, light.y, light.z, int(ReliefSecondColour(prop) >> 24),
+                 int(ReliefFirstColour(prop) >> 24), 1, W - 1, 1, H - 1};
     auto lightBoth = [&](int (*process)(void*)) {
         process(&job);
         if (!twoSided) return;
@@ -346,8 +346,8 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
     auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
     if (argb == nullptr) return;
     if (!twoSided) {
-        ReliefColourise(normal.first, normal.second, frame.pixels, g.gain, prop.highlightColor,
-                        prop.shadowColor, argb);
+        ReliefColourise(normal.first, normal.second, frame.pixels, g.gain, ReliefFirstColour(prop),
+                        ReliefSecondColour(prop), argb);
     } else {
         for (int y = 0; y < H; ++y) {
             const bool rowInside = y > M && y < H - M;
@@ -358,7 +358,7 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
                                   : 0;
                 argb[i] = TwoSidedPixel(ReliefTone(normal.first[i], normal.second[i], g.gain),
                                         ReliefTone(mirrored.first[i], mirrored.second[i], g.gain), m,
-                                        prop.highlightColor, prop.shadowColor);
+                                        ReliefFirstColour(prop), ReliefSecondColour(prop));
             }
         }
     }

@@ -39,11 +39,19 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "effect/GxProperty.h"
 #include "effect/filters/GxFilterLimits.h"
 #include "foundation/GxBitmap.h"
 #include "foundation/GxRect.h"
 
 namespace Glimmer {
+
+// The two washes of a relief. The lighting puts the "second" plane on the
+// slopes that face the light and the "first" on the others, for the bevel and
+// the emboss alike, so the second carries the record's highlight colour and
+// the first its shadow colour.
+inline uint32_t ReliefFirstColour(const GxBevelProperty& p) { return p.shadowColor; }
+inline uint32_t ReliefSecondColour(const GxBevelProperty& p) { return p.highlightColor; }
 
 struct GxReliefVariant {
     float coverageScale;     // edge fraction = mask byte / coverageScale

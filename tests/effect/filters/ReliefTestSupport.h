@@ -21,8 +21,8 @@ struct ReliefParams {
     int soften = 0;
     float angle = 120.0f;
     float altitude = 30.0f;
-    uint32_t first = 0xFFFF0000;   // the record's highlight colour: red
-    uint32_t second = 0xFF0000FF;  // its shadow colour: blue
+    uint32_t first = 0xFFFF0000;   // the first wash (the record's shadow colour): red
+    uint32_t second = 0xFF0000FF;  // the second wash (its highlight colour): blue
 };
 
 inline ReliefParams Relief(int style, int technique, float size, int soften = 0) {
@@ -37,7 +37,7 @@ inline ReliefParams Relief(int style, int technique, float size, int soften = 0)
 template <typename Record>
 Record MakeRecord(const ReliefParams& p) {
     return Record(p.style, p.depth, p.size, p.direction, p.technique, p.soften, 1.0f, p.angle,
-                  p.altitude, p.first, 1.0f, p.second, 1.0f);
+                  p.altitude, p.second, 1.0f, p.first, 1.0f);
 }
 
 // A mask and a 32-bit target of the same size, with the text rectangle
