@@ -11,6 +11,14 @@ packages=(
   googletest libbenchmark-dev
   # 64-bit Arm cross build, its tests run under emulation
   g++-aarch64-linux-gnu qemu-user
+  # text stack (shaping, glyph coverage, the system's font list) and real fonts for its tests
+  libharfbuzz-dev libfreetype-dev libfontconfig-dev fonts-dejavu-core fonts-noto-core fonts-noto-cjk
+  # the Java bridge: JNI headers, javac and the JVM its tests run on
+  openjdk-17-jdk-headless
+  # the same libraries for the Arm build, installed beside the native ones
+  libharfbuzz-dev:arm64 libfreetype-dev:arm64 libfontconfig-dev:arm64
+  # the command-line renderer: PNG files, line breaking, JSON effect files
+  libpng-dev libicu-dev nlohmann-json3-dev libpng-dev:arm64 libicu-dev:arm64
 )
 
 missing=()
@@ -25,6 +33,7 @@ if ((${#missing[@]})); then
   export DEBIAN_FRONTEND=noninteractive
   sudo_cmd=()
   [ "$(id -u)" -eq 0 ] || sudo_cmd=(sudo)
+  dpkg --print-foreign-architectures | grep -qx arm64 || "${sudo_cmd[@]}" dpkg --add-architecture arm64
   "${sudo_cmd[@]}" apt-get update -qq
   "${sudo_cmd[@]}" apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
 fi

@@ -1,0 +1,17 @@
+package android.graphics;
+
+/** Test stand-in of another framework version: no isItalic. */
+public class Typeface {
+    public static final int NORMAL = 0;
+    public static final int BOLD = 1;
+    public static final int ITALIC = 2;
+    public static final int BOLD_ITALIC = 3;
+
+    private final int style;
+
+    private Typeface(int style) { this.style = style; }
+
+    public static Typeface defaultFromStyle(int style) { return new Typeface(style); }
+
+    public boolean isBold() { return (style & BOLD) != 0; }
+}

@@ -1,0 +1,18 @@
+package android.graphics;
+
+/** Test stand-in: a typeface is only its style bits here. */
+public class Typeface {
+    public static final int NORMAL = 0;
+    public static final int BOLD = 1;
+    public static final int ITALIC = 2;
+    public static final int BOLD_ITALIC = 3;
+
+    private final int style;
+
+    private Typeface(int style) { this.style = style; }
+
+    public static Typeface defaultFromStyle(int style) { return new Typeface(style); }
+
+    public boolean isBold() { return (style & BOLD) != 0; }
+    public boolean isItalic() { return (style & ITALIC) != 0; }
+}
