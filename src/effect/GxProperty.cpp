@@ -82,6 +82,26 @@ GxGradient* GxCopyGradientStops(const GxGradient* stops, int32_t count) {
     return copy;
 }
 
+namespace {
+
+// The glow and gradient records either borrow their stops or own a private
+// copy that they free; these two keep that ownership straight for both.
+void DropOwnedStops(GxGradient* stops, bool* owns) {
+    if (*owns) delete[] stops;
+    *owns = false;
+}
+
+bool TakePrivateStops(GxGradient** stops, int32_t count, bool* owns) {
+    GxGradient* copy = GxCopyGradientStops(*stops, count);
+    bool ok = copy != nullptr || *stops == nullptr || count <= 0;
+    if (*owns) delete[] *stops;
+    *stops = copy;
+    *owns = copy != nullptr;
+    return ok;
+}
+
+}  // namespace
+
 // --- text
 
 GxTextProperty::GxTextProperty(uint32_t color, float opacity) : GxProperty(color, opacity) {}
@@ -151,8 +171,7 @@ GxOuterGlowProperty::GxOuterGlowProperty(const GxOuterGlowProperty& other)
 
 GxOuterGlowProperty& GxOuterGlowProperty::operator=(const GxOuterGlowProperty& other) {
     if (this == &other) return *this;
-    if (ownsStops_) delete[] stops;
-    ownsStops_ = false;
+    DropOwnedStops(stops, &ownsStops_);
     GxProperty::operator=(other);
     size = other.size;
     count = other.count;
@@ -160,18 +179,9 @@ GxOuterGlowProperty& GxOuterGlowProperty::operator=(const GxOuterGlowProperty& o
     return *this;
 }
 
-GxOuterGlowProperty::~GxOuterGlowProperty() {
-    if (ownsStops_) delete[] stops;
-}
+GxOuterGlowProperty::~GxOuterGlowProperty() { DropOwnedStops(stops, &ownsStops_); }
 
-bool GxOuterGlowProperty::copyStops() {
-    GxGradient* copy = GxCopyGradientStops(stops, count);
-    bool ok = copy != nullptr || stops == nullptr || count <= 0;
-    if (ownsStops_) delete[] stops;
-    stops = copy;
-    ownsStops_ = copy != nullptr;
-    return ok;
-}
+bool GxOuterGlowProperty::copyStops() { return TakePrivateStops(&stops, count, &ownsStops_); }
 
 int GxOuterGlowProperty::getSequentialCharLength() const { return StopsLength(count, 10); }
 
@@ -208,8 +218,7 @@ GxLinearGradientProperty::GxLinearGradientProperty(const GxLinearGradientPropert
 
 GxLinearGradientProperty& GxLinearGradientProperty::operator=(const GxLinearGradientProperty& other) {
     if (this == &other) return *this;
-    if (ownsStops_) delete[] stops;
-    ownsStops_ = false;
+    DropOwnedStops(stops, &ownsStops_);
     GxProperty::operator=(other);
     angle = other.angle;
     scale = other.scale;
@@ -218,18 +227,9 @@ GxLinearGradientProperty& GxLinearGradientProperty::operator=(const GxLinearGrad
     return *this;
 }
 
-GxLinearGradientProperty::~GxLinearGradientProperty() {
-    if (ownsStops_) delete[] stops;
-}
+GxLinearGradientProperty::~GxLinearGradientProperty() { DropOwnedStops(stops, &ownsStops_); }
 
-bool GxLinearGradientProperty::copyStops() {
-    GxGradient* copy = GxCopyGradientStops(stops, count);
-    bool ok = copy != nullptr || stops == nullptr || count <= 0;
-    if (ownsStops_) delete[] stops;
-    stops = copy;
-    ownsStops_ = copy != nullptr;
-    return ok;
-}
+bool GxLinearGradientProperty::copyStops() { return TakePrivateStops(&stops, count, &ownsStops_); }
 
 int GxLinearGradientProperty::getSequentialCharLength() const { return StopsLength(count, 5); }
 

@@ -37,6 +37,10 @@ std::shared_mutex& FontStateLock();
 // is looked up (null when it is no longer registered).
 GxTextObject* GetBoundTextObject(JNIEnv* env, jobject thiz);
 
+// GetBoundTextObject for a native: without an object it reports error 19
+// under kTextTag and gives null, and the native returns its failure value.
+GxTextObject* RequireBoundTextObject(JNIEnv* env, jobject thiz);
+
 // The Java object's `mHandle`; -1 when the field cannot be read.
 jint ReadHandle(JNIEnv* env, jobject thiz);
 

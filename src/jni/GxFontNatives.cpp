@@ -28,7 +28,6 @@
 
 #include "font/FontManager.h"
 #include "font/SystemFontFamilies.h"
-#include "foundation/Error.h"
 #include "foundation/GxLog.h"
 #include "foundation/List.h"
 #include "jni/GxBridge.h"
@@ -256,11 +255,8 @@ jboolean GxFontManager_SetFontConfig(JNIEnv* env, jclass, jobject fontConfig) {
 }
 
 jboolean GxText_SetFont(JNIEnv* env, jobject thiz, jstring fontFile) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) {
-        GX_REPORT_ERROR(kTextTag, kErrorNotBound);
-        return JNI_FALSE;
-    }
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     Jni::Utf8Chars path(env, fontFile);
     if (path.get() == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont() - Fail to get fontFile string");
@@ -271,11 +267,8 @@ jboolean GxText_SetFont(JNIEnv* env, jobject thiz, jstring fontFile) {
 }
 
 jboolean GxText_SetFont2(JNIEnv* env, jobject thiz, jstring fontName, jbyteArray buffer) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) {
-        GX_REPORT_ERROR(kTextTag, kErrorNotBound);
-        return JNI_FALSE;
-    }
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     if (fontName == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont2() - fontName is NULL");
         return JNI_FALSE;
@@ -297,11 +290,8 @@ jboolean GxText_SetFont2(JNIEnv* env, jobject thiz, jstring fontName, jbyteArray
 }
 
 jboolean GxText_SetFont3(JNIEnv* env, jobject thiz, jobject assetManager, jstring fontName) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) {
-        GX_REPORT_ERROR(kTextTag, kErrorNotBound);
-        return JNI_FALSE;
-    }
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     if (assetManager == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont3() - assetManager is NULL");
         return JNI_FALSE;

@@ -37,11 +37,8 @@ constexpr const char* kTag = Bridge::kTextTag;
 
 // The effect stack of the Java object's text; null after reporting why.
 GxEffect* BoundEffect(JNIEnv* env, jobject thiz, const char* missingMessage) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotBound);
-        return nullptr;
-    }
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return nullptr;
     GxEffect* effect = object->GetEffect();
     if (effect == nullptr && missingMessage != nullptr) LogPrint(kLogError, kTag, "%s", missingMessage);
     return effect;
@@ -161,22 +158,16 @@ jint GxText_GetEffectBottomOffset(JNIEnv* env, jobject thiz) {
 }
 
 jintArray GxText_GetDrawingBitmapSize(JNIEnv* env, jobject thiz) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotBound);
-        return nullptr;
-    }
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return nullptr;
     GxView* view = object->GetView();
     if (view == nullptr) return nullptr;
     return NewIntArray(env, view->GetDrawingBitmapSize(), 2);
 }
 
 jintArray GxText_RenderTextEffect(JNIEnv* env, jobject thiz) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotBound);
-        return nullptr;
-    }
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return nullptr;
     GxView* view = object->GetView();
     if (view == nullptr) return nullptr;
     GxEffect* effect = object->GetEffect();

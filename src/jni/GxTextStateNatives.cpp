@@ -155,11 +155,6 @@ LocalRef<jclass> ClassOf(JNIEnv* env, jobject object) {
     return LocalRef<jclass>(env, object != nullptr ? env->GetObjectClass(object) : nullptr);
 }
 
-jboolean NotBound() {
-    GX_REPORT_ERROR(kTag, kErrorNotBound);
-    return JNI_FALSE;
-}
-
 void DeleteLines(List* lines) {
     int count = lines->GetCount();
     for (int i = 0; i < count; ++i) delete static_cast<GxLineInfo*>(lines->Get(i));
@@ -250,6 +245,12 @@ GxTextObject* GetBoundTextObject(JNIEnv* env, jobject thiz) {
     return object;
 }
 
+GxTextObject* RequireBoundTextObject(JNIEnv* env, jobject thiz) {
+    GxTextObject* object = GetBoundTextObject(env, thiz);
+    if (object == nullptr) GX_REPORT_ERROR(kTag, kErrorNotBound);
+    return object;
+}
+
 }  // namespace Bridge
 
 void GxText_finalize(JNIEnv* env, jobject thiz) {
@@ -262,8 +263,8 @@ void GxText_finalize(JNIEnv* env, jobject thiz) {
 }
 
 jboolean GxText_SetPaint(JNIEnv* env, jobject thiz, jobject paint) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) return NotBound();
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     if (paint == nullptr) {
         LogPrint(kLogError, kTag, "GxText_SetPaint - paint is NULL");
         return JNI_FALSE;
@@ -328,8 +329,8 @@ jboolean GxText_SetPaint(JNIEnv* env, jobject thiz, jobject paint) {
 }
 
 jboolean GxText_SetView(JNIEnv* env, jobject thiz, jobject view) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) return NotBound();
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     if (view == nullptr) {
         LogPrint(kLogError, kTag, "GxText_SetView - view is NULL");
         return JNI_FALSE;
@@ -376,8 +377,8 @@ jboolean GxText_SetView(JNIEnv* env, jobject thiz, jobject view) {
 }
 
 jboolean GxText_SetLine(JNIEnv* env, jobject thiz, jint lines) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) return NotBound();
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     GxView* view = object->GetView();
     if (view == nullptr) return JNI_FALSE;
     view->lineLimit = lines;
@@ -385,8 +386,8 @@ jboolean GxText_SetLine(JNIEnv* env, jobject thiz, jint lines) {
 }
 
 jboolean GxText_SetLayout(JNIEnv* env, jobject thiz, jobject layout) {
-    GxTextObject* object = Bridge::GetBoundTextObject(env, thiz);
-    if (object == nullptr) return NotBound();
+    GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
+    if (object == nullptr) return JNI_FALSE;
     if (layout == nullptr) {
         LogPrint(kLogDebug, kTag, "GxText_SetLayout - RH(%d) null", object->GetRuntimeHandle());
         return JNI_FALSE;

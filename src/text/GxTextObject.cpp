@@ -31,6 +31,7 @@
 #include <cstdio>
 #include <mutex>
 #include <new>
+#include <type_traits>
 #include <vector>
 
 #include "effect/GxBlender.h"
@@ -131,6 +132,22 @@ struct GxTextObjectImpl {
     uint32_t textColor = 0xFF000000u;
 };
 
+namespace {
+
+// The plain getters: the member once constructed; before that the failure is
+// reported with the calling getter's own line and the fallback returned.
+template <class T>
+T MemberOr(const GxTextObjectImpl* m, T GxTextObjectImpl::*member, std::type_identity_t<T> fallback,
+           int line) {
+    if (m == nullptr) {
+        ReportError(kTag, kErrorNotConstructed, line);
+        return fallback;
+    }
+    return m->*member;
+}
+
+}  // namespace
+
 GxTextObjectImpl::GxTextObjectImpl(GxTextObject* owner) : owner(owner) {
     effect = new (std::nothrow) GxEffect();
     fontDrawing = new (std::nothrow) GxFontDrawing();
@@ -186,59 +203,31 @@ bool GxTextObject::Construct() {
 }
 
 int GxTextObject::GetRuntimeHandle() const {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return -1;
-    }
-    return M->runtimeHandle;
+    return MemberOr(M, &GxTextObjectImpl::runtimeHandle, -1, __LINE__);
 }
 
 GxEffect* GxTextObject::GetEffect() {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return nullptr;
-    }
-    return M->effect;
+    return MemberOr(M, &GxTextObjectImpl::effect, nullptr, __LINE__);
 }
 
 GxString* GxTextObject::GetText() {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return nullptr;
-    }
-    return M->text;
+    return MemberOr(M, &GxTextObjectImpl::text, nullptr, __LINE__);
 }
 
 GxFontDrawing* GxTextObject::GetFont() {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return nullptr;
-    }
-    return M->fontDrawing;
+    return MemberOr(M, &GxTextObjectImpl::fontDrawing, nullptr, __LINE__);
 }
 
 List* GxTextObject::GetLineInfo() {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return nullptr;
-    }
-    return M->lineInfo;
+    return MemberOr(M, &GxTextObjectImpl::lineInfo, nullptr, __LINE__);
 }
 
 GxView* GxTextObject::GetView() {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return nullptr;
-    }
-    return M->view;
+    return MemberOr(M, &GxTextObjectImpl::view, nullptr, __LINE__);
 }
 
 Platform::Paint GxTextObject::GetPaint() {
-    if (M == nullptr) {
-        GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        return Platform::Paint();
-    }
-    return M->paint;
+    return MemberOr(M, &GxTextObjectImpl::paint, Platform::Paint(), __LINE__);
 }
 
 void GxTextObject::SetPaint(Platform::Paint& paint) {

@@ -48,7 +48,6 @@
 
 #include <cmath>
 #include <cstdlib>
-#include <new>
 
 #include "effect/GxEffectMath.h"
 #include "effect/filters/GxSqrt.h"
@@ -62,22 +61,6 @@ constexpr int kExactFromRange = 11;
 }  // namespace
 
 GxBevel::GxBevel() { style = GxECore::kBevel; }
-
-GxBevel::~GxBevel() { delete property; }
-
-void GxBevel::setProperty(GxProperty* p) {
-    if (p == nullptr) return;
-    const auto* source = dynamic_cast<const GxBevelProperty*>(p);
-    if (source == nullptr) return;
-    auto* fresh = new (std::nothrow) GxBevelProperty(
-        source->style, source->depth, source->size, source->direction, source->technique,
-        source->soften, source->opacity, source->angle, source->altitude, source->highlightColor,
-        source->highlightOpacity, source->shadowColor, source->shadowOpacity);
-    delete property;
-    property = fresh;
-}
-
-GxProperty* GxBevel::getProperty() { return property; }
 
 int32_t GxBevel::getOffset() {
     int pixels = 0;
@@ -100,14 +83,6 @@ GxBevelGeometry GxBevel::geometry(const GxBevelProperty& property) {
     return g;
 }
 
-int GxBevel::blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height) {
-    return ReliefBlur(src, dst, stride, radius, height);
-}
-
-void GxBevel::dt1D(const float* f, float* d, int n) { ReliefDT1D(f, d, n); }
-
-int GxBevel::partialBlur(void* job) { return ReliefPartialBlur(job); }
-
 int GxBevel::partialDT(void* raw) {
     auto* job = static_cast<DistanceJob*>(raw);
     if (job == nullptr) return 0;
@@ -126,9 +101,8 @@ int GxBevel::partialLightProcess(void* raw) {
             const ptrdiff_t i = ptrdiff_t(y) * stride + x;
             const float* d = job->field + i;
             if (*d == range) continue;  // flat top or flat ground
-            const float gx = (d[-1] - d[1]) * 0.5f;
-            const float gy = (d[-stride] - d[stride]) * 0.5f;
-            const float level = ReliefClampLevel(ReliefIncidence(light, job->normalZ, gx, gy) * 255.0f);
+            const float level =
+                ReliefClampLevel(ReliefSlopeIncidence(light, job->normalZ, d, stride, 0.5f) * 255.0f);
             const float v = job->inside ? level : float(255 - int(level));
             const int edge = ReliefEdgeFactor(range - *d);
             job->secondPlane[i] = ReliefPlaneValue(job->secondAlpha * int(v + 1.0f), edge);

@@ -5,7 +5,6 @@
 
 #include <cstdint>
 
-#include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
 #include "effect/filters/GxRelief.h"
 
@@ -23,10 +22,8 @@ struct GxBevelGeometry {
     float gain = 1.0f;      // colouring gain: 1.83 smooth, 1.0 hard
 };
 
-class GxBevel : public GxECoreBase {
+class GxBevel : public GxReliefLayer<GxBevelProperty> {
 public:
-    using BlurJob = GxReliefBlurJob;
-
     // The local search over rows [y0, y1) of a width x height field.
     struct DistanceJob {
         float* field;
@@ -53,27 +50,16 @@ public:
     };
 
     GxBevel();
-    ~GxBevel() override;
 
     void doPostProcessing(GxECore::ParamPostProcessing* pp) override;
-    // Keeps a fresh record built through the record's constructor (its clamps
-    // and folds apply again); null and non-bevel records are ignored.
-    void setProperty(GxProperty* p) override;
-    GxProperty* getProperty() override;
     // soften + int(size + 0.5); 0 without a property or past the radius limit.
     int32_t getOffset() override;
 
     static GxBevelGeometry geometry(const GxBevelProperty& property);
 
-    static int blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height);
-    static void dt1D(const float* f, float* d, int n);
     // Work functions: one job record each, return 0.
-    static int partialBlur(void* job);
     static int partialDT(void* job);
     static int partialLightProcess(void* job);
-
-private:
-    GxBevelProperty* property = nullptr;
 };
 
 }  // namespace Glimmer

@@ -44,7 +44,6 @@
 
 #include <cmath>
 #include <cstdlib>
-#include <new>
 
 #include "effect/GxEffectMath.h"
 #include "effect/filters/GxSqrt.h"
@@ -87,22 +86,6 @@ uint32_t TwoSidedPixel(GxReliefTone normal, GxReliefTone mirrored, int m, uint32
 
 GxEmboss::GxEmboss() { style = GxECore::kEmboss; }
 
-GxEmboss::~GxEmboss() { delete property; }
-
-void GxEmboss::setProperty(GxProperty* p) {
-    if (p == nullptr) return;
-    const auto* source = dynamic_cast<const GxBevelProperty*>(p);
-    if (source == nullptr) return;
-    auto* fresh = new (std::nothrow) GxEmbossProperty(
-        source->style, source->depth, source->size, source->direction, source->technique,
-        source->soften, source->opacity, source->angle, source->altitude, source->highlightColor,
-        source->highlightOpacity, source->shadowColor, source->shadowOpacity);
-    delete property;
-    property = fresh;
-}
-
-GxProperty* GxEmboss::getProperty() { return property; }
-
 int32_t GxEmboss::getOffset() {
     int pixels = 0;
     if (property == nullptr || !ReliefSizePixels(property->size, &pixels)) return 0;
@@ -130,14 +113,6 @@ GxEmbossGeometry GxEmboss::geometry(const GxEmbossProperty& property) {
     g.exact = property.technique == 0 && g.size >= kExactFromSize;
     return g;
 }
-
-int GxEmboss::blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height) {
-    return ReliefBlur(src, dst, stride, radius, height);
-}
-
-void GxEmboss::dt1D(const float* f, float* d, int n) { ReliefDT1D(f, d, n); }
-
-int GxEmboss::partialBlur(void* job) { return ReliefPartialBlur(job); }
 
 int GxEmboss::partialOutDT(void* raw) {
     auto* job = static_cast<DistanceJob*>(raw);
@@ -198,9 +173,8 @@ int GxEmboss::partialLightHardProcess(void* raw) {
             const ptrdiff_t i = ptrdiff_t(y) * stride + x;
             const float* f = job->field + i;
             if (*f == outRange) continue;
-            const float gx = (f[-1] - f[1]) * 0.5f;
-            const float gy = (f[-stride] - f[stride]) * 0.5f;
-            const int n = int(ReliefClampLevel(ReliefIncidence(light, job->normalZ, gx, gy) * 255.0f));
+            const float incidence = ReliefSlopeIncidence(light, job->normalZ, f, stride, 0.5f);
+            const int n = int(ReliefClampLevel(incidence * 255.0f));
             // Outside the edge the height falls to Ro; inside, the flat floor 1 - Ri gives 0.
             const float e = *f > 0.0f ? outRange - *f : *f + inRange - 1.0f;
             const int edge = ReliefEdgeFactor(e);
@@ -223,9 +197,8 @@ int GxEmboss::partialLightSoftProcess(void* raw) {
             const ptrdiff_t i = ptrdiff_t(y) * stride + x;
             const float* o = job->field + i;
             if (*o > 0.0f && *o < outRange) {
-                const float gx = (o[-1] - o[1]) * 0.5f;
-                const float gy = (o[-stride] - o[stride]) * 0.5f;
-                const int n = int(ReliefClampLevel(ReliefIncidence(light, job->normalZ, gx, gy) * 255.0f));
+                const float incidence = ReliefSlopeIncidence(light, job->normalZ, o, stride, 0.5f);
+                const int n = int(ReliefClampLevel(incidence * 255.0f));
                 const int edge = ReliefEdgeFactor(outRange - *o);
                 job->secondPlane[i] = ReliefPlaneValue((256 - n) * job->secondAlpha, edge);
                 job->firstPlane[i] = ReliefPlaneValue((n + 1) * job->firstAlpha, edge);
@@ -234,9 +207,7 @@ int GxEmboss::partialLightSoftProcess(void* raw) {
             if (*in > 0.0f && *in < inRange) {
                 // The inward distance is a descending height: gradient negated,
                 // level inverted, the washes' roles swapped.
-                const float gx = (in[-1] - in[1]) * -0.5f;
-                const float gy = (in[-stride] - in[stride]) * -0.5f;
-                const float incidence = ReliefIncidence(light, job->normalZ, gx, gy);
+                const float incidence = ReliefSlopeIncidence(light, job->normalZ, in, stride, -0.5f);
                 const int n = int(ReliefClampLevel((1.0f - incidence) * 255.0f));
                 const int edge = ReliefEdgeFactor(inRange - *in);
                 job->secondPlane[i] = ReliefPlaneValue((n + 1) * job->secondAlpha, edge);

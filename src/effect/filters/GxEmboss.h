@@ -6,7 +6,6 @@
 
 #include <cstdint>
 
-#include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
 #include "effect/filters/GxRelief.h"
 
@@ -25,10 +24,8 @@ struct GxEmbossGeometry {
     float gain = 1.0f;      // colouring gain: 2.03 smooth, 1.0 hard
 };
 
-class GxEmboss : public GxECoreBase {
+class GxEmboss : public GxReliefLayer<GxEmbossProperty> {
 public:
-    using BlurJob = GxReliefBlurJob;
-
     // The two local passes over rows [y0, y1) of a width x height signed field.
     struct DistanceJob {
         float* field;
@@ -59,30 +56,19 @@ public:
     };
 
     GxEmboss();
-    ~GxEmboss() override;
 
     void doPostProcessing(GxECore::ParamPostProcessing* pp) override;
-    // As the bevel's: a fresh record through the constructor; null and
-    // non-relief records are ignored.
-    void setProperty(GxProperty* p) override;
-    GxProperty* getProperty() override;
     // int(ceil(size * 0.5 + 1)) + soften, from the untruncated size; 0 without
     // a property or past the radius limit.
     int32_t getOffset() override;
 
     static GxEmbossGeometry geometry(const GxEmbossProperty& property);
 
-    static int blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height);
-    static void dt1D(const float* f, float* d, int n);
     // Work functions: one job record each, return 0.
-    static int partialBlur(void* job);
     static int partialOutDT(void* job);
     static int partialInDT(void* job);
     static int partialLightSoftProcess(void* job);
     static int partialLightHardProcess(void* job);
-
-private:
-    GxEmbossProperty* property = nullptr;
 };
 
 }  // namespace Glimmer

@@ -38,7 +38,9 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <new>
 
+#include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
 #include "effect/filters/GxFilterLimits.h"
 #include "foundation/GxBitmap.h"
@@ -187,6 +189,15 @@ inline float ReliefNormalZ(float depth, float floor) { return 2.4f / (depth > fl
 // Cosine-like lighting term of a slope (gx, gy) under `light`.
 float ReliefIncidence(const GxReliefLight& light, float normalZ, float gx, float gy);
 
+// The incidence at height-field pixel `d` from its central differences, each
+// scaled by `half` (0.5f for a rising height, -0.5f for a descending one).
+inline float ReliefSlopeIncidence(const GxReliefLight& light, float normalZ, const float* d,
+                                  ptrdiff_t stride, float half) {
+    const float gx = (d[-1] - d[1]) * half;
+    const float gy = (d[-stride] - d[stride]) * half;
+    return ReliefIncidence(light, normalZ, gx, gy);
+}
+
 // Clamped to at most 255, then to at least 0; NaN gives 0.
 inline float ReliefClampLevel(float level) {
     if (level > 255.0f) level = 255.0f;
@@ -282,5 +293,45 @@ bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, int sm
 // for `separateWorkImage`.
 void ReliefDrawFrame(const GxReliefVariant& variant, const GxReliefFrame& frame,
                      const uint32_t* argb, int separateWorkImage, GxBitmap* dst, GxBitmap* extra);
+
+// ---- the layer base
+
+// What the bevel and the emboss layers share: the record they own (Record is
+// GxBevelProperty or GxEmbossProperty) and the shared passes under the
+// names both layers carry.
+template <class Record>
+class GxReliefLayer : public GxECoreBase {
+public:
+    using BlurJob = GxReliefBlurJob;
+
+    ~GxReliefLayer() override { delete property; }
+
+    // Keeps a fresh record of the layer's own type built through its
+    // constructor, so its clamps and folds apply again; null and non-relief
+    // records are ignored.
+    void setProperty(GxProperty* p) override {
+        if (p == nullptr) return;
+        const auto* source = dynamic_cast<const GxBevelProperty*>(p);
+        if (source == nullptr) return;
+        auto* fresh = new (std::nothrow) Record(
+            source->style, source->depth, source->size, source->direction, source->technique,
+            source->soften, source->opacity, source->angle, source->altitude, source->highlightColor,
+            source->highlightOpacity, source->shadowColor, source->shadowOpacity);
+        delete property;
+        property = fresh;
+    }
+
+    GxProperty* getProperty() override { return property; }
+
+    static int blur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height) {
+        return ReliefBlur(src, dst, stride, radius, height);
+    }
+    static void dt1D(const float* f, float* d, int n) { ReliefDT1D(f, d, n); }
+    // Work function: one GxReliefBlurJob, returns 0.
+    static int partialBlur(void* job) { return ReliefPartialBlur(job); }
+
+protected:
+    Record* property = nullptr;
+};
 
 }  // namespace Glimmer
