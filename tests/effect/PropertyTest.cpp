@@ -152,7 +152,6 @@ TEST(PropertyRecord, ConstructorsClampAndFold) {
     EXPECT_EQ(linear.angle, -30.0f);
     EXPECT_EQ(linear.scale, 2.0f);
     EXPECT_EQ(linear.color, 0u);
-    EXPECT_EQ(linear.opacity, 0.25f);
     EXPECT_EQ(GxRadialGradientProperty(0, -1.0f, 0, 0, nullptr).scale, 0.0f);
 
     // Depth and soften are clamped, size is not (large bevels are real).
@@ -163,9 +162,6 @@ TEST(PropertyRecord, ConstructorsClampAndFold) {
     EXPECT_EQ(bevel.angle, 5.0f);
     EXPECT_EQ(bevel.altitude, -10.0f);
     EXPECT_EQ(bevel.color, 0u);
-    EXPECT_EQ(bevel.opacity, 0.5f);
-    EXPECT_EQ(bevel.highlightColor, 1u);
-    EXPECT_EQ(bevel.shadowOpacity, 0.2f);
     GxEmbossProperty emboss(3, -1.0f, 1.0f, 0, 0, -3, 1.0f, 0.0f, 0.0f, 0, 0.0f, 0, 0.0f);
     EXPECT_EQ(emboss.depth, 0.0f);
     EXPECT_EQ(emboss.soften, 0);

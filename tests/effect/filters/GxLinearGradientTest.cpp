@@ -8,14 +8,14 @@
 
 #include "effect/filters/GxColorRamp.h"
 #include "effect/filters/GxLinearGradient.h"
-#include "LayerCanvas.h"
+#include "effect/filters/LayerHarness.h"
 
 namespace Glimmer {
 namespace {
 
-using testing::LayerCanvas;
-using testing::Px;
-using testing::Stop;
+using Testing::LayerCanvas;
+using Testing::Px;
+using Testing::Stop;
 
 constexpr uint32_t kBlack = 0xFF000000u, kWhite = 0xFFFFFFFFu;
 const std::vector<GxGradient> kBlackToWhite{Stop(kBlack, 0.0f), Stop(kWhite, 1.0f)};

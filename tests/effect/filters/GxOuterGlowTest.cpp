@@ -8,14 +8,14 @@
 #include <vector>
 
 #include "effect/filters/GxOuterGlow.h"
-#include "LayerCanvas.h"
+#include "effect/filters/LayerHarness.h"
 
 namespace Glimmer {
 namespace {
 
-using testing::LayerCanvas;
-using testing::Px;
-using testing::Stop;
+using Testing::LayerCanvas;
+using Testing::Px;
+using Testing::Stop;
 
 constexpr uint32_t kRed = 0xFFFF0000u, kBlack = 0xFF000000u, kWhite = 0xFFFFFFFFu;
 

