@@ -110,16 +110,5 @@ TEST(SystemFontFamiliesTest, TheSystemHasAFamilyForEachMajorScript) {
     }
 }
 
-TEST(SystemFontFamiliesTest, InstallingTwiceKeepsTheFirstFamilies) {
-    FontManager* manager = FontManager::GetInstance();
-    ASSERT_TRUE(InstallSystemFontFamilies());
-    const List* first = manager->GetSystemFontFamilies();
-    ASSERT_NE(first, nullptr);
-    ASSERT_GT(first->GetCount(), 1);
-    EXPECT_EQ(At(*first, 0)->built, 1);   // the default family is loaded at once
-    EXPECT_TRUE(InstallSystemFontFamilies());
-    EXPECT_EQ(manager->GetSystemFontFamilies(), first);
-}
-
 }  // namespace
 }  // namespace Glimmer

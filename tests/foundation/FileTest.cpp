@@ -15,12 +15,7 @@
 namespace Glimmer {
 namespace {
 
-template <typename Op>
-int CodeOf(Op op) {
-    Error::SetError(0);
-    op();
-    return Error::GetError();
-}
+using Testing::CodeOf;
 
 class FileTest : public ::testing::Test {
 protected:

@@ -3,7 +3,6 @@
 #include <cstring>
 
 #include "foundation/GxBitmap.h"
-#include "foundation/GxNew.h"
 
 namespace Glimmer {
 namespace {
@@ -31,10 +30,6 @@ TEST(GxBitmap, ConstructorsSetFormatAndClearPixels) {
     ASSERT_NE(color.pixels, nullptr);
     EXPECT_EQ(color.format, 1u);
     EXPECT_TRUE(AllZero(color));
-
-    GxBitmap zeroWide(0, 9, 1);
-    EXPECT_EQ(zeroWide.width, 0u);
-    EXPECT_EQ(zeroWide.height, 9u);
 }
 
 TEST(GxBitmap, SizeProductThatDoesNotFitIsRefused) {
@@ -110,14 +105,6 @@ TEST(GxBitmap, SubImageCopiesOneBytePerPixel) {
     // Corners at the ends of the int32 range: the size is their distance.
     GxRect wide(INT32_MIN, 0, INT32_MAX, 0);
     EXPECT_EQ(uint32_t(wide.Width()), 0xFFFFFFFFu);
-}
-
-TEST(GxBitmap, DeletesThroughBasePointers) {
-    GxNew* value = new GxNew();
-    delete value;
-    GxRect r(5, 9, 1, 2);
-    EXPECT_EQ(r.Width(), 4);
-    EXPECT_EQ(r.Height(), 7);
 }
 
 }  // namespace

@@ -1,9 +1,6 @@
 #include <gtest/gtest.h>
 
-#include <clocale>
-#include <cstdlib>
 #include <cstring>
-#include <random>
 #include <string>
 #include <vector>
 
@@ -31,13 +28,7 @@ std::vector<uint16_t> Utf16(const GxString& s) {
     return out;
 }
 
-// Runs `op` and returns the error code it left (0 when it set none).
-template <typename Op>
-int CodeOf(Op op) {
-    Error::SetError(0);
-    op();
-    return Error::GetError();
-}
+using Testing::CodeOf;
 
 TEST(GxString, UnconstructedStringFailsEverywhereWithCode8) {
     Testing::LogCapture capture;
@@ -218,37 +209,6 @@ TEST(GxString, EncodesUtf8ToTheByte) {
     char out[16];
     EXPECT_EQ(CodeOf([&] { EXPECT_EQ(s.GetUTF8(out, 16), -1); }), 7);
     EXPECT_STREQ(out, "ok");
-}
-
-TEST(GxString, Utf8RoundTripsAndMatchesTheCLibrary) {
-    // A UTF-8 C library is the reference for Unicode scalar values; the
-    // string itself never consults the locale.
-    const char* saved = std::setlocale(LC_CTYPE, nullptr);
-    const std::string previous = saved != nullptr ? saved : "C";
-    const bool haveReference = std::setlocale(LC_CTYPE, "C.UTF-8") != nullptr;
-    std::mt19937 random(7);
-    const uint32_t limits[4] = {0x80, 0x800, 0x10000, 0x110000};  // 1 to 4 bytes
-    for (int n = 0; n < 300; ++n) {
-        std::wstring w;
-        for (int i = int(random() % 12); i > 0; --i) {
-            uint32_t c;
-            do c = 1 + random() % (limits[random() % 4] - 1);
-            while (c >= 0xD800 && c <= 0xDFFF);
-            w.push_back(wchar_t(c));
-        }
-        GxString a, b;
-        ASSERT_TRUE(a.Construct(w.c_str()));
-        const std::string bytes = Utf8(a);
-        ASSERT_TRUE(b.Construct(bytes.c_str()));
-        EXPECT_EQ(Text(b), w);
-        if (haveReference) {
-            std::vector<char> reference(w.size() * 4 + 1);
-            size_t length = std::wcstombs(reference.data(), w.c_str(), reference.size());
-            EXPECT_EQ(bytes, std::string(reference.data(), length));
-        }
-    }
-    std::setlocale(LC_CTYPE, previous.c_str());
-    if (!haveReference) GTEST_SKIP() << "no C.UTF-8 locale to compare with";
 }
 
 TEST(GxString, Utf16CountsUFFFFAsAPair) {

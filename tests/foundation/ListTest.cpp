@@ -12,12 +12,7 @@ namespace {
 int gItems[16];
 void* Item(int i) { return &gItems[i]; }
 
-template <typename Op>
-int CodeOf(Op op) {
-    Error::SetError(0);
-    op();
-    return Error::GetError();
-}
+using Testing::CodeOf;
 
 // The items as indexes into gItems, read through Get (which uses its cache)
 // and checked against a plain walk with a cursor.

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "foundation/Error.h"
 #include "platform/Log.h"
 
 namespace Glimmer::Testing {
@@ -32,6 +33,15 @@ public:
         for (const LogLine& line : Lines()) n += (line.tag == tag && line.message == message);
         return n;
     }
+    // Error reports ("@ Native Error <code> : ...") at error priority under `tag`.
+    int CountErrors(const std::string& tag, int code) const {
+        const std::string prefix = "@ Native Error " + std::to_string(code) + " : ";
+        int n = 0;
+        for (const LogLine& line : Lines()) {
+            n += line.tag == tag && line.priority == 6 && line.message.rfind(prefix, 0) == 0;
+        }
+        return n;
+    }
     void Clear() {
         std::lock_guard<std::mutex> lock(mutex_);
         lines_.clear();
@@ -47,5 +57,13 @@ private:
     mutable std::mutex mutex_;
     std::vector<LogLine> lines_;
 };
+
+// Runs `op` on a cleared error slot; the code it left (0 when none).
+template <typename Op>
+int CodeOf(Op op) {
+    Error::SetError(0);
+    op();
+    return Error::GetError();
+}
 
 }  // namespace Glimmer::Testing

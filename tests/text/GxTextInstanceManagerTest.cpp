@@ -102,12 +102,7 @@ TEST(GxTextInstanceManagerTest, ReleasingTheUnknownFailsWithCodeNine) {
     Error::SetError(0);
     EXPECT_FALSE(Registry::Release(&unbound, true));
     EXPECT_EQ(Error::GetError(), 9);
-    int failures = 0;
-    for (const Testing::LogLine& line : log.Lines()) {
-        failures += line.tag == "GxTextInstanceManager" && line.priority == 6 &&
-                    line.message.rfind("@ Native Error 9 : ", 0) == 0;
-    }
-    EXPECT_EQ(failures, 2);
+    EXPECT_EQ(log.CountErrors("GxTextInstanceManager", 9), 2);
     EXPECT_EQ(Registry::FindGxTextObject(123456789), nullptr);
     EXPECT_EQ(log.Count("GxTextInstanceManager", "FindGxTextObject() - Can't find the handle[123456789]"), 1);
 }

@@ -26,15 +26,6 @@ namespace {
 
 using Testing::LogCapture;
 
-int CountErrors(const LogCapture& log, const char* tag, int code) {
-    int n = 0;
-    const std::string prefix = "@ Native Error " + std::to_string(code) + " : ";
-    for (const Testing::LogLine& line : log.Lines()) {
-        n += line.tag == tag && line.priority == 6 && line.message.rfind(prefix, 0) == 0;
-    }
-    return n;
-}
-
 TEST(GxTextObjectTest, AnUnconstructedObjectFailsWithCodeEight) {
     LogCapture log;
     {
@@ -48,9 +39,9 @@ TEST(GxTextObjectTest, AnUnconstructedObjectFailsWithCodeEight) {
         EXPECT_FALSE(text.SetFont("/no/such/font.ttf"));
         EXPECT_EQ(text.RenderTextEffect(10, 10), nullptr);
         EXPECT_EQ(text.GetPaint().size, Platform::Paint().size);
-        EXPECT_EQ(CountErrors(log, "GxTextObject", 8), 7);
+        EXPECT_EQ(log.CountErrors("GxTextObject", 8), 7);
     }
-    EXPECT_EQ(CountErrors(log, "GxTextObject", 8), 8);   // the destructor too
+    EXPECT_EQ(log.CountErrors("GxTextObject", 8), 8);   // the destructor too
 }
 
 TEST(GxTextObjectTest, ASecondConstructFailsAndKeepsTheHandle) {
@@ -81,13 +72,6 @@ TEST(GxTextObjectTest, SettersCheckTheirArguments) {
     EXPECT_EQ(Error::GetError(), 7);
     EXPECT_FALSE(text.SetFont("/no/such/font.ttf"));
     EXPECT_EQ(text.GetFont()->GetFontPath(), nullptr);   // a failed font is not taken
-
-    EXPECT_TRUE(text.SetTextStyle(true, false));
-    EXPECT_TRUE(text.isBoldTextStyle());
-    EXPECT_FALSE(text.isItalicTextStyle());
-    EXPECT_TRUE(text.SetTextStyle(false, true));
-    EXPECT_FALSE(text.isBoldTextStyle());
-    EXPECT_TRUE(text.isItalicTextStyle());
 
     GxView* view = text.GetView();
     ASSERT_TRUE(view->SetBitmapWidth(40));

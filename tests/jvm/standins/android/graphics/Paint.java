@@ -8,11 +8,9 @@ public class Paint {
     public static final int FAKE_BOLD_TEXT_FLAG = 0x20;
     public static final int SUBPIXEL_TEXT_FLAG = 0x80;
 
-    public enum Align {
-        LEFT,
-        CENTER,
-        RIGHT
-    }
+    // The natives read an alignment by its name(), which the older one lacks.
+    public enum Align { LEFT, CENTER, RIGHT } // older: absent
+    // older: public static final class Align { public static final Align LEFT = new Align(), CENTER = new Align(), RIGHT = new Align(); }
 
     private float textScaleX = 1f;
     private float textSkewX = 0f;
@@ -41,7 +39,7 @@ public class Paint {
     public void setTextLocales(LocaleList v) { textLocales = v; }
     public Align getTextAlign() { return textAlign; }
     public void setTextAlign(Align v) { textAlign = v; }
-    public int getColor() { return color; }
+    public int getColor() { return color; } // older: absent
     public void setColor(int v) { color = v; }
     public float getTextSize() { return textSize; }
     public void setTextSize(float v) { textSize = v; }

@@ -14,5 +14,5 @@ public class Typeface {
     public static Typeface defaultFromStyle(int style) { return new Typeface(style); }
 
     public boolean isBold() { return (style & BOLD) != 0; }
-    public boolean isItalic() { return (style & ITALIC) != 0; }
+    public boolean isItalic() { return (style & ITALIC) != 0; } // older: absent
 }

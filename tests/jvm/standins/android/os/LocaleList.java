@@ -8,5 +8,5 @@ public final class LocaleList {
 
     public static LocaleList forLanguageTags(String tags) { return new LocaleList(tags); }
 
-    public String toLanguageTags() { return tags; }
+    public String toLanguageTags() { return tags; } // older: absent
 }

@@ -21,7 +21,7 @@ public class FontConfig {
         public int getTtcIndex() { return ttcIndex; }
         public int getWeight() { return weight; }
         public boolean isItalic() { return italic; }
-        public String getFallbackFor() { return fallbackFor; }
+        public String getFallbackFor() { return fallbackFor; } // older: absent
     }
 
     public static class Family {
@@ -43,9 +43,9 @@ public class FontConfig {
         public int getVariant() { return variant; }
     }
 
-    private final Family[] families;
+    protected final Family[] families;
 
     public FontConfig(Family... families) { this.families = families; }
 
-    public Family[] getFamilies() { return families; }
+    public Family[] getFamilies() { return families; } // older: absent
 }

@@ -53,7 +53,7 @@ public class Layout {
     public int getLineVisibleEnd(int line) { return at(line).visibleEnd; }
     public float getLineLeft(int line) { return at(line).left; }
     public float getLineRight(int line) { return at(line).left + at(line).width; }
-    public float getLineMax(int line) { return at(line).width; }
+    public float getLineMax(int line) { return at(line).width; } // older: absent
     public float getLineWidth(int line) { return at(line).width; }
     public CharSequence getText() { return text; }
 

@@ -38,6 +38,6 @@ public class TextView {
     }
     public int getGravity() { return gravity; }
     public void setGravity(int g) { gravity = g; }
-    public int getMaxLines() { return maxLines; }
+    public int getMaxLines() { return maxLines; } // older: absent
     public void setMaxLines(int n) { maxLines = n; }
 }

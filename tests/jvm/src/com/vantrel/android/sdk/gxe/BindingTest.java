@@ -34,20 +34,6 @@ public class BindingTest {
     }
 
     @Test
-    public void handlesCountUpAndAreNeverReused() {
-        GxText a = new GxText();
-        int ha = bound(a);
-        a.close();
-        GxText b = new GxText();
-        int hb = bound(b);
-        Check.equal(ha + 1, hb, "handle after a release");
-        GxText c = new GxText();
-        Check.equal(hb + 1, bound(c), "next handle");
-        b.close();
-        c.close();
-    }
-
-    @Test
     public void finaliserAsFirstCallMakesNothing() {
         GxText before = new GxText();
         int last = bound(before);
