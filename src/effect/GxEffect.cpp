@@ -454,8 +454,9 @@ void GxEffect::initEffect(int width, int height) {
 }
 
 void GxEffect::renderEffectLayer(int x, int y, GxGlyph* glyph) {
-    // A zero-sized mask covers nothing, so it does not stretch the text box.
-    if (glyph != nullptr && srcBitmap != nullptr && glyph->width > 0 && glyph->height > 0) {
+    // Every glyph stretches the text box, a zero-sized one too: its mask
+    // draws nothing, but its place still counts.
+    if (glyph != nullptr && srcBitmap != nullptr) {
         auto saturate = [](int64_t v) { return int32_t(std::clamp<int64_t>(v, INT32_MIN, INT32_MAX)); };
         const int32_t right = saturate(int64_t(x) + glyph->width);
         const int32_t bottom = saturate(int64_t(y) + glyph->height);
@@ -508,9 +509,9 @@ void GxEffect::chooseTargets(GxECoreBase* layer, GxECore::ParamPostProcessing* p
 
 void GxEffect::doEffectPostProcessing() {
     GX_EFFECT_LOG("DoEffectPostProcessing(%p) - start", static_cast<void*>(this));
-    // No glyph since the last post-processing: the box of this drawing is
-    // empty, whatever the previous drawing left in textRect.
-    if (textRectReset) textRect = GxRect();
+    // A drawing without glyphs keeps the box the previous drawing left here
+    // (already clamped to that drawing's mask): only the first glyph of a
+    // drawing starts a new box.
     const int32_t maskWidth = srcBitmap != nullptr ? int32_t(srcBitmap->width) : 0;
     const int32_t maskHeight = srcBitmap != nullptr ? int32_t(srcBitmap->height) : 0;
     textRect.left = std::min(std::max(textRect.left, 0), maskWidth);

@@ -519,13 +519,11 @@ TEST(EffectStackDrawing, EmptyOrOutsideBoxesCallNoLayer) {
         return s.journal.posts.size();
     };
     EXPECT_EQ(posts(10, &outside), 0u);
-    EXPECT_EQ(posts(1, &inside), 1u);
-    // No glyph in this drawing: the last drawing's box is not reused.
-    EXPECT_EQ(posts(0, nullptr), 0u);
-    // A zero-sized mask covers nothing and opens no box, but layers still see it.
+    // A zero-sized mask alone opens a box with no area; layers still see it.
     s.journal.renders.clear();
     EXPECT_EQ(posts(1, &empty), 0u);
     EXPECT_EQ(s.journal.renders.size(), 1u);
+    EXPECT_EQ(posts(1, &inside), 1u);
 
     // Drawing before initEffect, and a negative surface, stay harmless.
     GxEffect bare(nullptr);
@@ -542,6 +540,45 @@ TEST(EffectStackDrawing, EmptyOrOutsideBoxesCallNoLayer) {
 std::array<int, 4> At(const GxBitmap& b, int i) {
     const uint8_t* p = b.pixels + i * 4;
     return {p[0], p[1], p[2], p[3]};
+}
+
+// An inside stroke paints everything outside the glyphs, so its reach shows
+// which text box the layers were given.
+struct InsideStrokeDrawing {
+    GxEffect stack{nullptr};
+    GxBitmap dst;
+    InsideStrokeDrawing(int w, int h) : dst(unsigned(w), unsigned(h), 4) {
+        stack.addStrokeText(1, 0xFF0000FF, 1, 0, 2);
+        stack.addText(0xFF000000);
+    }
+    // One whole drawing; returns the text box the layers were given.
+    std::array<int, 4> Run(std::vector<std::pair<GxGlyph, std::array<int, 2>>> glyphs) {
+        std::memset(dst.pixels, 0, size_t(dst.width) * dst.height * 4);
+        stack.initEffect(int(dst.width), int(dst.height));
+        stack.setDstBitmap(&dst);
+        for (auto& [glyph, at] : glyphs) stack.renderEffectLayer(at[0], at[1], &glyph);
+        stack.doEffectPostProcessing();
+        const GxRect box = *stack.getTextRect();
+        stack.compositeLayers(&dst);
+        return {box.left, box.top, box.right, box.bottom};
+    }
+};
+
+TEST(EffectStackDrawing, ZeroSizedGlyphsWidenTheBoxAndEmptyDrawingsReuseIt) {
+    unsigned char full[4] = {255, 255, 255, 255};
+    const GxGlyph square{full, 2, 2, 0, 0}, line{full, 0, 3, 0, 0};
+    {
+        InsideStrokeDrawing d(8, 5);
+        EXPECT_EQ(d.Run({{square, {2, 2}}, {line, {6, 1}}}), (std::array<int, 4>{2, 1, 6, 4}));
+        EXPECT_EQ(At(d.dst, 0)[3], 255);  // a 2x2 box would leave the corner at 149
+    }
+    {
+        InsideStrokeDrawing d(6, 5);
+        EXPECT_EQ(d.Run({{square, {2, 2}}}), (std::array<int, 4>{2, 2, 4, 4}));
+        // No glyph: the previous box again, over an empty mask.
+        EXPECT_EQ(d.Run({}), (std::array<int, 4>{2, 2, 4, 4}));
+        EXPECT_EQ(At(d.dst, 0)[2], 255);
+    }
 }
 
 TEST(EffectStackComposite, StraightColourWithTheTextAlpha) {

@@ -40,9 +40,10 @@
 //     cancel here.
 //  6. The frame is blended into the destination with mode 1 in the separate-
 //     work-image mode and mode 2 otherwise.
-// The first colour is the record's highlight colour, the second its shadow
-// colour; only their alpha and colour bytes are used (the float opacities are
-// already folded into them by the stack).
+// The second wash, the one on the slopes that face the light, takes the
+// record's highlight colour, the first its shadow colour; only their alpha and
+// colour bytes are used (the float opacities are already folded into them by
+// the stack).
 
 #include "effect/filters/GxBevel.h"
 
@@ -65,21 +66,26 @@ GxBevel::GxBevel() { style = GxECore::kBevel; }
 int32_t GxBevel::getOffset() {
     int pixels = 0;
     if (property == nullptr || !ReliefSizePixels(property->size, &pixels)) return 0;
-    return ReliefSoften(property->soften) + EffectMath::TruncToInt(property->size + 0.5f);
+    const int offset = ReliefSoften(property->soften) + EffectMath::TruncToInt(property->size + 0.5f);
+    return offset > 0 ? offset : 0;  // a negative size asks for no margin
 }
 
 GxBevelGeometry GxBevel::geometry(const GxBevelProperty& property) {
     GxBevelGeometry g;
     if (!ReliefSizePixels(property.size, &g.size)) return g;
-    g.drawable = true;
     g.soften = ReliefSoften(property.soften);
-    const bool smooth = property.technique == 0;
-    g.smoothRadius = smooth ? int(std::ceil(float(2 * g.size) / 3.0f + 1.0f)) : 0;
-    g.range = smooth ? g.smoothRadius : g.size + 2;
+    g.smooth = property.technique == 0;
+    g.smoothRadius = g.smooth ? int(std::ceil(float(2 * g.size) / 3.0f + 1.0f)) : 0;
+    g.range = g.smooth ? g.smoothRadius : g.size + 2;
     const int spread = 2 * g.smoothRadius > 2 * g.soften ? 2 * g.smoothRadius : 2 * g.soften;
     g.margin = g.range + spread;
-    g.exact = smooth && g.range >= kExactFromRange;
-    g.gain = smooth ? kBevelVariant.smoothGain : 1.0f;
+    g.exact = g.smooth && g.range >= kExactFromRange;
+    g.gain = g.smooth ? kBevelVariant.smoothGain : 1.0f;
+    // Sizes below zero follow the same arithmetic while it stays inside the
+    // frame: a negative range only empties the search windows. A negative
+    // margin would put the text outside its own frame, and a negative
+    // smoothing radius would blur outside the planes: those draw nothing.
+    g.drawable = g.margin >= 0 && g.smoothRadius >= 0;
     return g;
 }
 
@@ -186,7 +192,7 @@ void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
     partialLightProcess(&lightJob);
     std::free(field);
 
-    if (!ReliefSmoothAndSoften(&planes, W, H, g.smoothRadius, g.soften)) return;
+    if (!ReliefSmoothAndSoften(&planes, W, H, g.smooth, g.smoothRadius, g.soften)) return;
 
     auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
     if (argb == nullptr) return;

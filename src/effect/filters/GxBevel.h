@@ -12,8 +12,10 @@ namespace Glimmer {
 
 // Everything a bevel derives from its property before touching a pixel.
 struct GxBevelGeometry {
-    bool drawable = false;  // false when the size is too large for any frame
-    int size = 0;           // r = int(size), at least 0
+    bool drawable = false;  // false for sizes past the radius limit, or whose frame
+                            // or smoothing radius would come out negative
+    int size = 0;           // r = int(size), truncated toward zero
+    bool smooth = false;    // the smooth technique (0): the planes are blurred with Rs
     int smoothRadius = 0;   // Rs: ceil(2r / 3 + 1) for the smooth technique, else 0
     int range = 0;          // Rd: Rs for the smooth technique, r + 2 for the hard one
     int soften = 0;

@@ -89,16 +89,18 @@ GxEmboss::GxEmboss() { style = GxECore::kEmboss; }
 int32_t GxEmboss::getOffset() {
     int pixels = 0;
     if (property == nullptr || !ReliefSizePixels(property->size, &pixels)) return 0;
-    return EffectMath::TruncToInt(std::ceil(property->size * 0.5f + 1.0f)) + ReliefSoften(property->soften);
+    const int offset =
+        EffectMath::TruncToInt(std::ceil(property->size * 0.5f + 1.0f)) + ReliefSoften(property->soften);
+    return offset > 0 ? offset : 0;  // a negative size asks for no margin
 }
 
 GxEmbossGeometry GxEmboss::geometry(const GxEmbossProperty& property) {
     GxEmbossGeometry g;
     if (!ReliefSizePixels(property.size, &g.size)) return g;
-    g.drawable = true;
     g.soften = ReliefSoften(property.soften);
+    g.smooth = property.technique == 0;
     const float half = float(g.size) * 0.5f;
-    if (property.technique != 0) {
+    if (!g.smooth) {
         g.outRange = int(std::ceil(half + 3.0f));
         g.inRange = int(std::ceil(half + 1.0f));
         g.smoothRadius = 0;
@@ -110,7 +112,12 @@ GxEmbossGeometry GxEmboss::geometry(const GxEmbossProperty& property) {
     }
     const int spread = 2 * g.smoothRadius > 2 * g.soften ? 2 * g.smoothRadius : 2 * g.soften;
     g.margin = g.outRange + spread;
-    g.exact = property.technique == 0 && g.size >= kExactFromSize;
+    g.exact = g.smooth && g.size >= kExactFromSize;
+    // Sizes below zero follow the same arithmetic while it stays inside the
+    // frame: negative ranges only empty the search windows. A negative margin
+    // would put the text outside its own frame, and a negative smoothing
+    // radius would blur outside the planes: those draw nothing.
+    g.drawable = g.margin >= 0 && g.smoothRadius >= 0;
     return g;
 }
 
@@ -311,8 +318,8 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
         std::free(field);
     }
 
-    if (twoSided && !ReliefSmoothAndSoften(&mirrored, W, H, g.smoothRadius, g.soften)) return;
-    if (!ReliefSmoothAndSoften(&normal, W, H, g.smoothRadius, g.soften)) return;
+    if (twoSided && !ReliefSmoothAndSoften(&mirrored, W, H, g.smooth, g.smoothRadius, g.soften)) return;
+    if (!ReliefSmoothAndSoften(&normal, W, H, g.smooth, g.smoothRadius, g.soften)) return;
 
     auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
     if (argb == nullptr) return;

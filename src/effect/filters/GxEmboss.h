@@ -13,8 +13,10 @@ namespace Glimmer {
 
 // Everything an emboss derives from its property before touching a pixel.
 struct GxEmbossGeometry {
-    bool drawable = false;  // false when the size is too large for any frame
-    int size = 0;           // r = int(size), at least 0
+    bool drawable = false;  // false for sizes past the radius limit, or whose frame
+                            // or smoothing radius would come out negative
+    int size = 0;           // r = int(size), truncated toward zero
+    bool smooth = false;    // the smooth technique (0): the planes are blurred with Rs
     int outRange = 0;       // Ro
     int inRange = 0;        // Ri
     int smoothRadius = 0;   // Rs (0 for the hard technique)

@@ -38,12 +38,13 @@ inline int ClampRadius(int radius, int width, int height) {
 }  // namespace
 
 bool ReliefSizePixels(float size, int* pixels) {
-    if (!(size > 0.0f)) {
+    if (size != size) {  // NaN: no size at all
         *pixels = 0;
         return true;
     }
-    if (!(size < float(kMaxFilterRadius + 1))) return false;
-    *pixels = int(size);
+    const float limit = float(kMaxFilterRadius + 1);
+    if (!(size < limit && size > -limit)) return false;
+    *pixels = int(size);  // toward zero: -1.5 is -1
     return true;
 }
 
@@ -448,11 +449,12 @@ bool GxReliefPlanes::Allocate(size_t pixels) {
     return second != nullptr && first != nullptr;
 }
 
-bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, int smoothRadius,
-                           int soften) {
+bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, bool smooth,
+                           int smoothRadius, int soften) {
     const size_t pixels = size_t(width) * size_t(height);
     unsigned char* scratch = nullptr;
-    if (smoothRadius >= 1) {
+    if (smooth) {
+        if (smoothRadius < 0) return false;  // its region would leave the planes
         auto* third = static_cast<unsigned char*>(std::calloc(pixels, 1));
         if (third == nullptr) return false;
         bool ok = ReliefBlur(planes->second, third, width, smoothRadius, height) == 0 &&

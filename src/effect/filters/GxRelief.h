@@ -71,9 +71,9 @@ inline constexpr GxReliefVariant kEmbossVariant = {254.999f, 0.2f, 2.03f, 2, 1, 
 // because their margins and blur regions are built from it.
 inline constexpr int kReliefMaxSoften = 16;
 
-// int(size) for the radii: negative and NaN sizes act as 0; false when it
-// exceeds kMaxFilterRadius (GxFilterLimits.h): such a relief draws nothing and
-// asks for no margin.
+// int(size) for the radii, truncated toward zero (negative sizes stay
+// negative; NaN acts as 0); false when its magnitude exceeds kMaxFilterRadius
+// (GxFilterLimits.h): such a relief draws nothing and asks for no margin.
 bool ReliefSizePixels(float size, int* pixels);
 inline int ReliefSoften(int soften) {
     return soften < 0 ? 0 : (soften > kReliefMaxSoften ? kReliefMaxSoften : soften);
@@ -273,7 +273,8 @@ struct GxReliefPlanes {
     unsigned char* first = nullptr;
 };
 
-// Smoothing (smoothRadius >= 1), then softening (soften >= 1), of both planes
+// Smoothing (when `smooth`: the smooth technique, whatever its radius; a
+// radius of 0 copies), then softening (soften >= 1), of both planes
 // of a width x height frame:
 //   smoothing: a fresh zeroed plane P; blur second -> P, first -> second's
 //     buffer; then second = P, first = old second buffer, scratch = old first
@@ -281,10 +282,10 @@ struct GxReliefPlanes {
 //   softening: scratch (or, without smoothing, a fresh zeroed plane); blur
 //     second -> scratch, first -> second's buffer; then second = scratch,
 //     first = second's buffer; the remaining buffer is freed.
-// false when a plane or a blur's scratch could not be had (planes then hold
-// an unspecified but valid state).
-bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, int smoothRadius,
-                           int soften);
+// false when a plane or a blur's scratch could not be had, or the smoothing
+// radius is negative (planes then hold an unspecified but valid state).
+bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, bool smooth,
+                           int smoothRadius, int soften);
 
 // ---- drawing
 

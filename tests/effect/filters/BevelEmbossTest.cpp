@@ -26,13 +26,26 @@ TEST(Bevel, RadiusSelection) {
                   Row{3, 0, 5, 3, 3, 13, false},     // soften wider than the smoothing
                   Row{10, 1, 0, 0, 12, 12, false},   // hard: r + 2, never exact
                   Row{60, 1, 16, 0, 62, 94, false},
-                  Row{-7, 0, 0, 1, 1, 3, false}}) {  // negative sizes act as 0
+                  Row{-1, 1, 0, 0, 1, 1, false},     // int(size) toward zero: r = -1, Rd = 1
+                  Row{-1, 0, 0, 1, 1, 3, false},     // ceil(-2 / 3 + 1)
+                  Row{-3, 1, 1, 0, -1, 1, false}}) { // a negative range only empties the windows
         const GxBevelGeometry g = GxBevel::geometry(MakeRecord<GxBevelProperty>(Relief(1, r.technique, r.size, r.soften)));
         EXPECT_TRUE(g.drawable && g.smoothRadius == r.rs && g.range == r.rd && g.margin == r.margin &&
                     g.exact == r.exact && g.gain == (r.technique == 0 ? 1.83f : 1.0f))
             << "size " << r.size << " technique " << r.technique;
     }
-    EXPECT_FALSE(GxBevel::geometry(MakeRecord<GxBevelProperty>(Relief(1, 0, 1e9f))).drawable);
+    // Refused: past the radius limit, a frame smaller than the text, a blur
+    // radius below zero. Margins stay what the size gives, at least 0.
+    for (ReliefParams p : {Relief(1, 0, 1e9f), Relief(1, 1, -3), Relief(1, 0, -3, 4)}) {
+        EXPECT_FALSE(GxBevel::geometry(MakeRecord<GxBevelProperty>(p)).drawable) << p.size;
+    }
+    GxBevel bevel;
+    GxBevelProperty record = MakeRecord<GxBevelProperty>(Relief(1, 0, -3, 4));
+    bevel.setProperty(&record);
+    EXPECT_EQ(bevel.getOffset(), 4 - 2);  // soften + int(-2.5)
+    record = MakeRecord<GxBevelProperty>(Relief(1, 0, -9, 4));
+    bevel.setProperty(&record);
+    EXPECT_EQ(bevel.getOffset(), 0);
 }
 
 TEST(Bevel, KeepsARecordCopyAndPadsTheCanvas) {
@@ -111,7 +124,10 @@ TEST(Emboss, RadiusSelectionAndOffset) {
                   Row{11, 1, 5, 9, 7, 0, 19, false},    // h = 5.5
                   Row{25, 0, 0, 8, 8, 14, 36, false},   // local passes up to 25
                   Row{26, 0, 16, 8, 8, 14, 40, true},   // the exact transform from 26
-                  Row{26, 2, 0, 16, 14, 0, 16, false}}) {
+                  Row{26, 2, 0, 16, 14, 0, 16, false},
+                  Row{-2, 1, 0, 2, 0, 0, 2, false},     // r = -2, h = -1: ceil(2), ceil(0)
+                  Row{-9, 1, 2, -1, -3, 0, 3, false},   // negative ranges, frame from soften
+                  Row{-3, 0, 0, 1, 1, 0, 1, false}}) {  // smoothing radius 0 still smooths
         const GxEmbossGeometry g =
             GxEmboss::geometry(MakeRecord<GxEmbossProperty>(Relief(0, r.technique, r.size, r.soften)));
         EXPECT_TRUE(g.drawable && g.outRange == r.ro && g.inRange == r.ri && g.smoothRadius == r.rs &&
@@ -124,6 +140,12 @@ TEST(Emboss, RadiusSelectionAndOffset) {
     emboss.setProperty(&record);
     EXPECT_NE(emboss.getProperty(), &record);
     EXPECT_EQ(emboss.getOffset(), 7 + 2);  // ceil(5.25 + 1): int(10.5) would give 6
+    for (ReliefParams p : {Relief(0, 1, -9), Relief(0, 0, -4, 3)}) {  // M < 0; Rs = -1
+        EXPECT_FALSE(GxEmboss::geometry(MakeRecord<GxEmbossProperty>(p)).drawable) << p.size;
+        record = MakeRecord<GxEmbossProperty>(p);
+        emboss.setProperty(&record);
+        EXPECT_EQ(emboss.getOffset(), p.size == -9 ? 0 : 3 - 1);  // ceil(-4.5 + 1) = -3; ceil(-1) + 3
+    }
 }
 
 TEST(Emboss, LocalPassesByHand) {

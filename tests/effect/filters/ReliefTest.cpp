@@ -182,16 +182,22 @@ TEST(ReliefKernels, BlursRotateThePlanesAndKeepOuterStrips) {
         for (int i = 0; i < 7; ++i) r.insert(r.end(), {p[i], p[42 + i], p[i * 7], p[i * 7 + 6]});
         return std::all_of(r.begin(), r.end(), [&](uint8_t v) { return v == r[0]; }) ? int(r[0]) : -1;
     };
-    struct Case { int smooth, soften, secondRing, firstRing; };
-    for (Case c : {Case{1, 0, 0, 30}, Case{1, 1, 90, 0}, Case{0, 1, 0, 30}}) {
+    // Smoothing with radius 0 (a smooth relief of a negative size) copies, but
+    // still rotates the buffers, so the softened ring differs from no smoothing.
+    struct Case { bool smooth; int radius, soften, secondRing, firstRing; };
+    for (Case c : {Case{true, 1, 0, 0, 30}, Case{true, 1, 1, 90, 0}, Case{false, 0, 1, 0, 30},
+                   Case{true, 0, 1, 90, 30}}) {
         GxReliefPlanes p;
         ASSERT_TRUE(p.Allocate(49));
         std::memset(p.second, 30, 49);
         std::memset(p.first, 90, 49);
-        ASSERT_TRUE(ReliefSmoothAndSoften(&p, 7, 7, c.smooth, c.soften));
-        EXPECT_EQ(ringOf(p.second), c.secondRing) << c.smooth << c.soften;
-        EXPECT_EQ(ringOf(p.first), c.firstRing) << c.smooth << c.soften;
+        ASSERT_TRUE(ReliefSmoothAndSoften(&p, 7, 7, c.smooth, c.radius, c.soften));
+        EXPECT_EQ(ringOf(p.second), c.secondRing) << c.smooth << c.radius << c.soften;
+        EXPECT_EQ(ringOf(p.first), c.firstRing) << c.smooth << c.radius << c.soften;
     }
+    GxReliefPlanes p;
+    ASSERT_TRUE(p.Allocate(49));
+    EXPECT_FALSE(ReliefSmoothAndSoften(&p, 7, 7, true, -1, 0));  // would blur outside the planes
 }
 
 TEST(ReliefKernels, FramesAndSizes) {
@@ -200,8 +206,9 @@ TEST(ReliefKernels, FramesAndSizes) {
     EXPECT_TRUE(f.width == 8 && f.height == 8 && f.x0 == 6 && f.y0 == 16);
     EXPECT_FALSE(ReliefPlanFrame(GxRect(0, 0, 100, 100), 40000, &f));
     int r = -1;
-    EXPECT_TRUE(ReliefSizePixels(-3.0f, &r) && r == 0);
+    EXPECT_TRUE(ReliefSizePixels(-3.7f, &r) && r == -3);  // toward zero, no clamp
     EXPECT_TRUE(ReliefSizePixels(NAN, &r) && r == 0);
+    EXPECT_FALSE(ReliefSizePixels(-1025.0f, &r));
     EXPECT_TRUE(ReliefSizePixels(14.9f, &r) && r == 14);
     EXPECT_TRUE(ReliefSizePixels(1024.9f, &r) && r == 1024);
     EXPECT_FALSE(ReliefSizePixels(1025.0f, &r));  // the filters' radius limit
@@ -356,11 +363,12 @@ TYPED_TEST(ReliefLayer, MissingAndExtremeInputIsClean) {
         ReliefCanvas t(6, 5, 3);
         t.FillSquare(1);
         this->Run(t, p);
-        EXPECT_EQ(t.DrawnPixels() > 0, !(size > 1e6f)) << size;  // NaN and negatives act as 0
+        // NaN acts as 0; -50 gives a frame smaller than the text and draws nothing.
+        EXPECT_EQ(t.DrawnPixels() > 0, size != size) << size;
         typename TypeParam::Record huge = MakeRecord<typename TypeParam::Record>(p);
         bare.setProperty(&huge);
-        if (size > 1e6f) {
-            EXPECT_EQ(bare.getOffset(), 0);  // past the radius limit: no margin either
+        if (size == size) {
+            EXPECT_EQ(bare.getOffset(), 0) << size;  // no margin either
         }
     }
 }
