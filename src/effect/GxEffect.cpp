@@ -115,7 +115,8 @@ GxEffect::GxEffect(const GxEffect& other)
       textOpacity(other.textOpacity),
       textColor(other.textColor),
       nextEffectId(other.nextEffectId),
-      textAlpha(other.textAlpha) {
+      textAlpha(other.textAlpha),
+      layerStyle(other.layerStyle) {
     for (GxECoreBase* layer : other.layers)
         addEffect(layer->getId(), layer->getStyle(), layer->getProperty());
 }
@@ -427,7 +428,7 @@ void GxEffect::initEffect(int width, int height) {
     }
 
     separateWorkImage = 0;
-    if (textOpacity < 1.0f) {
+    if (textOpacity < 1.0f || layerStyle) {
         separateWorkImage = 1;
     } else {
         for (GxECoreBase* layer : layers) {

@@ -72,6 +72,15 @@ public:
     int addText(unsigned color, float opacity);
     int addText(unsigned color);
 
+    // Layer-style rendering, for the front ends; off by default, which is the
+    // exact behaviour. On, every drawing runs with the separate work image, so
+    // what the inner effects paint stays inside the glyphs, and the glyph
+    // drawing gives the text layer the text opacity as a fill opacity (the
+    // other layers keep theirs). The stacking order follows the order of
+    // adding, as always: add from the bottom layer up.
+    void setLayerStyle(bool on) { layerStyle = on; }
+    bool getLayerStyle() const { return layerStyle; }
+
     void setTextOpacity(float opacity);
     float getTextOpacity() const { return textOpacity; }
     void clearTextOpacity() { textOpacity = 1.0f; }
@@ -131,6 +140,7 @@ private:
     uint32_t textColor = 0xFF000000u;
     int32_t nextEffectId = 0;
     int32_t textAlpha = -1;  // low byte used
+    bool layerStyle = false;
 };
 
 }  // namespace Glimmer

@@ -162,7 +162,11 @@ void GxFontDrawing::DrawTextEffect(GxTextObject* text, GxBitmap* dst) {
     if (dst == nullptr) return;
 
     Platform::Paint paint = text->GetPaint();
-    effect->addText(text->GetTextColor());
+    if (effect->getLayerStyle()) {
+        effect->addText(text->GetTextColor(), effect->getTextOpacity());  // the fill opacity
+    } else {
+        effect->addText(text->GetTextColor());
+    }
     effect->initEffect(int(dst->width), int(dst->height));
     effect->setDstBitmap(dst);
 

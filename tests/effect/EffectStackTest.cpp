@@ -352,6 +352,7 @@ TEST(EffectStackDrawing, ModeFollowsOpacityEmbossAndCentredStroke) {
         {"inside bevel", [](GxEffect& s) { AddBevel(s, 5, 1); }, 0},
         {"translucent text", [](GxEffect& s) { s.addText(0xFF000000); s.setTextOpacity(0.99f); }, 1},
         {"empty", [](GxEffect&) {}, 0},
+        {"layer style", [](GxEffect& s) { s.addText(0xFF000000); s.setLayerStyle(true); }, 1},
     };
     for (const ModeCase& c : cases) {
         RecordingStack s;

@@ -243,6 +243,49 @@ TEST_F(RenderTest, HelloHasCoverageAtItsGlyphsAndEffectsInTheMargins) {
     EXPECT_EQ(Alpha(At(width - 1, height - 1)), 0);
 }
 
+// Layer-style rendering keeps an inside stroke inside the glyphs (the exact
+// mode paints the whole text box with it) and fades only the fill.
+TEST_F(RenderTest, LayerStyleKeepsInnerEffectsInsideAndFadesOnlyTheFill) {
+    Prepare(L"H", 48.0f);
+    AddLine(0, 1, 10, 60, -45, 12, 60);
+    HandOverLines();
+    GxEffect* effect = text.GetEffect();
+    struct Picture {
+        std::vector<unsigned> pixels;
+        int width, left, top;   // the view's corner sits at (left, top)
+    };
+    auto render = [&](bool layerStyle, float fillOpacity, int strokePosition) {
+        effect->cleanAllEffect();
+        effect->setLayerStyle(layerStyle);
+        effect->setTextOpacity(fillOpacity);
+        if (strokePosition >= 0) effect->addStrokeText(3.0f, 0xFFFFD000u, 1.0f, 0, strokePosition);
+        const int left = effect->getLeftOffset(), top = effect->getTopOffset();
+        EXPECT_NE(Render(80, 80), nullptr);
+        return Picture{std::vector<unsigned>(pixels, pixels + size_t(width) * size_t(height)), width, left, top};
+    };
+    const Picture plain = render(false, 1.0f, -1);
+    // Painted pixels of `p` whose glyph coverage (alpha of the plain text) passes `where`.
+    auto count = [&](const Picture& p, auto where) {
+        int n = 0;
+        for (int y = 0; y < 80; ++y) {
+            for (int x = 0; x < 80; ++x) {
+                const unsigned painted = p.pixels[size_t(y + p.top) * p.width + size_t(x + p.left)];
+                n += Alpha(painted) != 0 && where(Alpha(plain.pixels[size_t(y) * plain.width + size_t(x)]));
+            }
+        }
+        return n;
+    };
+    auto outsideGlyphs = [](int coverage) { return coverage == 0; };
+    auto deepInside = [](int coverage) { return coverage == 255; };
+    EXPECT_GT(count(render(false, 1.0f, 2), outsideGlyphs), 100);  // between the bars of the H
+    EXPECT_EQ(count(render(true, 1.0f, 2), outsideGlyphs), 0);
+    // Fill opacity 0: an outline, nothing inside it.
+    const Picture outline = render(true, 0.0f, 1);
+    EXPECT_EQ(count(outline, deepInside), 0);
+    EXPECT_GT(count(outline, outsideGlyphs), 100);
+    EXPECT_EQ(count(render(false, 0.0f, 1), deepInside), count(plain, deepInside));  // exact: opaque
+}
+
 TEST_F(RenderTest, LinesArePlacedAtTheirBaselines) {
     Prepare(L"HH\nHH", 32.0f, 0xFF000000u);
     AddLine(0, 2, 5, 40, -30, 8, 50);
