@@ -10,6 +10,9 @@
 // even when no face could be made of them: asking again for the same path
 // fails the same way without reading the file again. Bytes handed in by a
 // caller belong to the face made of them (or are freed when none is made).
+// Only regular files are read: a pipe, directory or device is refused as a
+// file that cannot be opened. Every failure leaves the calling thread a
+// reason in words (Error).
 //
 // Families for a text: the text's own font first, as a family of one, its
 // weight and slant taken from its name when the name has a dash after its
@@ -20,7 +23,13 @@
 
 #include "font/FontManager.h"
 
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
 #include <cstdio>
+#include <cstring>
 #include <map>
 #include <new>
 #include <string>
@@ -156,6 +165,7 @@ bool FontManager::AddMinikinFont(const char* path, char* data, unsigned int size
     }
     if (path == nullptr || path[0] == '\0') {
         Platform::LogPrint(Platform::kLogDebug, kTag, "AddMinikinFont() - path is NULL");
+        Error::SetReason("no font path or name was given");
         delete[] data;
         return false;
     }
@@ -173,6 +183,10 @@ bool FontManager::AddMinikinFont(const char* path, char* data, unsigned int size
         if (found != M->fontDataMap.end()) {
             data = found->second->data;
             size = found->second->size;
+            if (data == nullptr) {
+                Error::SetReason("%s: could not be read when it was first asked for, and a font file is read only once",
+                                 path);
+            }
         } else {
             size = 0;
             data = getFontData(path, size);
@@ -195,6 +209,8 @@ bool FontManager::AddMinikinFont(const char* path, char* data, unsigned int size
 
     if (data == nullptr || size == 0) {
         Platform::LogPrint(Platform::kLogError, kTag, "AddMinikinFont() - Fail to get font");
+        // A file that could not be read has said why already.
+        if (!shared) Error::SetReason("%s: no font bytes were given", path);
         if (!shared) delete[] data;
         return false;
     }
@@ -203,6 +219,7 @@ bool FontManager::AddMinikinFont(const char* path, char* data, unsigned int size
         data, size, ttcIndex, shared ? Platform::FontData::kBorrowed : Platform::FontData::kAdoptArray);
     if (font == nullptr) {
         Platform::LogPrint(Platform::kLogError, kTag, "AddMinikinFont() - Fail to create typeface");
+        Error::SetReason("%s: not a font (no face %d could be read from its %u bytes)", path, ttcIndex, size);
         if (!shared) delete[] data;
         return false;
     }
@@ -228,13 +245,38 @@ bool FontManager::AddMinikinFont(const GxString* path, char* data, unsigned int 
     return added;
 }
 
+namespace {
+
+// The file for reading, or null (errno set; ENXIO for anything but a
+// regular file). Reading a pipe would wait for a writer that may never come,
+// a directory has no bytes, a device no end: only regular files are fonts.
+// Opened without blocking, so that the check itself cannot wait on a pipe.
+FILE* OpenFontFile(const char* path) {
+    int fd = ::open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK);
+    if (fd < 0) return nullptr;
+    struct stat info;
+    if (::fstat(fd, &info) != 0 || !S_ISREG(info.st_mode)) {
+        ::close(fd);
+        errno = ENXIO;
+        return nullptr;
+    }
+    FILE* file = ::fdopen(fd, "rb");
+    if (file == nullptr) ::close(fd);
+    return file;
+}
+
+}  // namespace
+
 char* getFontData(const char* path, unsigned int& size) {
-    FILE* file = std::fopen(path, "rb");
+    FILE* file = OpenFontFile(path);
     if (file == nullptr) {
+        Error::SetReason("%s: cannot be opened (%s)", path,
+                         errno == ENXIO ? "not a regular file" : std::strerror(errno));
         Platform::LogPrint(Platform::kLogDebug, kTag, "getFontData: fail open file path = %s", path);
         return nullptr;
     }
     if (std::fseek(file, 0, SEEK_END) != 0) {
+        Error::SetReason("%s: cannot be read (%s)", path, std::strerror(errno));
         Platform::LogPrint(Platform::kLogDebug, kTag,
                            "getFontData: fseek(file, 0, SEEK_END) failure path = %s", path);
         std::fclose(file);
@@ -242,11 +284,13 @@ char* getFontData(const char* path, unsigned int& size) {
     }
     long length = std::ftell(file);
     if (length < 1) {
+        Error::SetReason("%s: empty file", path);
         Platform::LogPrint(Platform::kLogDebug, kTag, "getFontData: font length is 0 path = %s", path);
         std::fclose(file);
         return nullptr;
     }
     if (std::fseek(file, 0, SEEK_SET) != 0) {
+        Error::SetReason("%s: cannot be read (%s)", path, std::strerror(errno));
         Platform::LogPrint(Platform::kLogDebug, kTag,
                            "getFontData: fseek(file, 0, SEEK_SET) failure path = %s", path);
         std::fclose(file);
@@ -254,7 +298,15 @@ char* getFontData(const char* path, unsigned int& size) {
     }
     // Too large to hold, or no memory: reported as the read that cannot happen.
     char* data = length <= kMaxFontFileBytes ? new (std::nothrow) char[size_t(length)] : nullptr;
+    errno = 0;
     if (data == nullptr || std::fread(data, 1, size_t(length), file) != size_t(length)) {
+        if (length > kMaxFontFileBytes) {
+            Error::SetReason("%s: too large for a font file (%ld bytes)", path, length);
+        } else if (data == nullptr) {
+            Error::SetReason("%s: no memory for its %ld bytes", path, length);
+        } else {
+            Error::SetReason("%s: cannot be read (%s)", path, errno != 0 ? std::strerror(errno) : "cut short");
+        }
         Platform::LogPrint(Platform::kLogDebug, kTag, "getFontData: fread failure path = %s length = %zu",
                            path, size_t(length));
         delete[] data;

@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <memory>
 #include <random>
@@ -6,6 +7,7 @@
 #include <vector>
 
 #include "font/FontManager.h"
+#include "foundation/Error.h"
 #include "foundation/GxString.h"
 #include "foundation/List.h"
 #include "platform/TextLayout.h"
@@ -137,7 +139,15 @@ TEST_F(FontManagerTest, AnExistingFaceIsKeptAndTheNewBytesFreed) {
     EXPECT_EQ(first, second);
 }
 
-TEST_F(FontManagerTest, UnreadableFontsFailWithTheirLogLines) {
+// The thread's reason after a failure, for people: its words are checked
+// loosely, only what a caller needs to tell the failures apart.
+::testing::AssertionResult ReasonSays(const std::string& words) {
+    const std::string reason = Error::GetReason();
+    if (reason.find(words) != std::string::npos) return ::testing::AssertionSuccess();
+    return ::testing::AssertionFailure() << "reason \"" << reason << "\" does not say \"" << words << "\"";
+}
+
+TEST_F(FontManagerTest, UnreadableFontsFailWithTheirLogLinesAndReasons) {
     Testing::TempDir dir;
     const std::string missing = dir.Path() + "/missing.ttf";
     const std::string empty = dir.Write("empty.ttf", {});
@@ -145,30 +155,48 @@ TEST_F(FontManagerTest, UnreadableFontsFailWithTheirLogLines) {
     std::mt19937 random(11);
     for (char& c : noise) c = char(random());
     const std::string corrupt = dir.Write("corrupt.ttf", noise);
+    const std::string pipe = dir.Path() + "/pipe.ttf";
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
 
     LogCapture log;
     EXPECT_FALSE(manager.AddMinikinFont(missing.c_str(), nullptr, 0, 0, true));
     EXPECT_EQ(log.Count("GxFontManager", "getFontData: fail open file path = " + missing), 1);
     EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - Fail to get font"), 1);
+    EXPECT_TRUE(ReasonSays(missing + ": cannot be opened (No such file or directory)"));
     // The failed read is remembered: no second attempt at the file.
     log.Clear();
     EXPECT_FALSE(manager.AddMinikinFont(missing.c_str(), nullptr, 0, 0, true));
     EXPECT_EQ(log.Count("GxFontManager", "getFontData: fail open file path = " + missing), 0);
     EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - Fail to get font"), 1);
+    EXPECT_TRUE(ReasonSays("first asked for"));
+
+    // A pipe is refused at once instead of waiting for a writer, and a
+    // directory before its "size" is taken.
+    EXPECT_FALSE(manager.AddMinikinFont(pipe.c_str(), nullptr, 0, 0, true));
+    EXPECT_EQ(log.Count("GxFontManager", "getFontData: fail open file path = " + pipe), 1);
+    EXPECT_TRUE(ReasonSays(pipe + ": cannot be opened (not a regular file)"));
+    EXPECT_FALSE(manager.AddMinikinFont(dir.Path().c_str(), nullptr, 0, 0, true));
+    EXPECT_EQ(log.Count("GxFontManager", "getFontData: fail open file path = " + dir.Path()), 1);
+    EXPECT_TRUE(ReasonSays("not a regular file"));
 
     EXPECT_FALSE(manager.AddMinikinFont(empty.c_str(), nullptr, 0, 0, true));
     EXPECT_EQ(log.Count("GxFontManager", "getFontData: font length is 0 path = " + empty), 1);
+    EXPECT_TRUE(ReasonSays("empty file"));
     EXPECT_FALSE(manager.AddMinikinFont(corrupt.c_str(), nullptr, 0, 0, true));
+    EXPECT_TRUE(ReasonSays(corrupt + ": not a font"));
     EXPECT_FALSE(manager.AddMinikinFont(corrupt.c_str(), nullptr, 0, 0, true));
     EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - Fail to create typeface"), 2);
     EXPECT_FALSE(manager.AddMinikinFont(Testing::kDejaVuSans, nullptr, 0, 1, true));   // no face 1
     EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - Fail to create typeface"), 3);
+    EXPECT_TRUE(ReasonSays("no face 1"));
     EXPECT_FALSE(manager.AddMinikinFont("bytes", NewArray(dejavu), 0, 0, true));
-    EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - Fail to get font"), 3);
+    EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - Fail to get font"), 5);
+    EXPECT_TRUE(ReasonSays("bytes: no font bytes"));
 
     EXPECT_FALSE(manager.AddMinikinFont(static_cast<const char*>(nullptr), nullptr, 0, 0, true));
     EXPECT_FALSE(manager.AddMinikinFont("", NewArray(dejavu), unsigned(dejavu.size()), 0, true));
     EXPECT_EQ(log.Count("GxFontManager", "AddMinikinFont() - path is NULL"), 2);
+    EXPECT_TRUE(ReasonSays("no font path"));
     EXPECT_FALSE(manager.IsExisting(nullptr, 0));
     EXPECT_EQ(log.Count("GxFontManager", "IsExisting() - path is NULL"), 1);
 

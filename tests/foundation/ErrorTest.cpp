@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <cstring>
+#include <string>
 #include <thread>
 
 #include "foundation/Error.h"
@@ -21,6 +23,23 @@ TEST(Error, SlotIsPerThread) {
     EXPECT_EQ(otherBefore, 0);
     EXPECT_EQ(otherAfter, 11);
     EXPECT_EQ(Error::GetError(), 9);
+}
+
+TEST(Error, ReasonIsPerThreadAndReportingACodeSetsItsPhrase) {
+    Error::SetReason("%s: %d", "first", 1);
+    std::string other;
+    std::thread([&] {
+        other = Error::GetReason();
+        GX_REPORT_ERROR("GxTest", kErrorNotBound);
+        EXPECT_STREQ(Error::GetReason(), (std::string("error 19: ") + ReasonOfCode(kErrorNotBound)).c_str());
+    }).join();
+    EXPECT_EQ(other, "");
+    EXPECT_STREQ(Error::GetReason(), "first: 1");
+    // A long reason is cut, never overrun.
+    Error::SetReason("%s", std::string(5000, 'x').c_str());
+    EXPECT_EQ(std::strlen(Error::GetReason()), size_t(Error::kMaxReasonBytes - 1));
+    Error::ClearReason();
+    EXPECT_STREQ(Error::GetReason(), "");
 }
 
 TEST(Error, ReportLogsCodeAndLineUnderTag) {

@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <string>
 #include <vector>
@@ -27,6 +28,8 @@ TEST(AssetsTest, AssetsAreFilesUnderTheRootAndNothingElse) {
     EXPECT_EQ(assets.Open(nullptr), nullptr);
     EXPECT_EQ(assets.Open(""), nullptr);
     EXPECT_EQ(assets.Open("."), nullptr);   // a folder is no asset
+    ASSERT_EQ(::mkfifo((dir.Path() + "/pipe.bin").c_str(), 0600), 0);
+    EXPECT_EQ(assets.Open("pipe.bin"), nullptr);   // refused, not waited on
     const std::string outside = "../" + dir.Path().substr(dir.Path().rfind('/') + 1) + "/font.bin";
     EXPECT_EQ(assets.Open(outside.c_str()), nullptr);
     EXPECT_EQ(assets.Open((dir.Path() + "/font.bin").c_str()), nullptr);   // absolute

@@ -49,7 +49,9 @@ bool InsideRoot(const std::string& name) {
 std::unique_ptr<Asset> AssetManager::Open(const char* name) const {
     if (name == nullptr || !InsideRoot(name)) return nullptr;
     std::string path = root_.empty() ? std::string(name) : root_ + "/" + name;
-    int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    // Without blocking: opening a pipe would wait for a writer before the
+    // check below could refuse it.
+    int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
     if (fd < 0) return nullptr;
     struct stat info;
     if (::fstat(fd, &info) != 0 || !S_ISREG(info.st_mode)) {
