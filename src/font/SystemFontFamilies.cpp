@@ -102,10 +102,15 @@ bool ConvertToFontFamilies(FontManager* manager, const std::vector<Platform::Sys
 bool InstallSystemFontFamilies(FontManager* manager) {
     if (manager == nullptr) return false;
     if (manager->IsSystemFontFamiliesAlreadySet()) return true;
+    return InstallSystemFontFamilies(manager, Platform::GetSystemFontFamilies());
+}
+
+bool InstallSystemFontFamilies(FontManager* manager, const std::vector<Platform::SystemFontFamily>& config) {
+    if (manager == nullptr) return false;
+    if (manager->IsSystemFontFamiliesAlreadySet()) return true;
     auto* families = new (std::nothrow) List();
     if (families == nullptr) return false;
-    if (!families->Construct() ||
-        !ConvertToFontFamilies(manager, Platform::GetSystemFontFamilies(), families)) {
+    if (!families->Construct() || !ConvertToFontFamilies(manager, config, families)) {
         int count = families->GetCount();
         for (int i = 0; i < count; ++i) DeleteFontFamily(static_cast<GxFontFamily*>(families->Get(i)));
         delete families;

@@ -28,5 +28,8 @@ bool ConvertToFontFamilies(FontManager* manager, const std::vector<Platform::Sys
 // before (nothing changes then).
 bool InstallSystemFontFamilies(FontManager* manager);
 bool InstallSystemFontFamilies();
+// The same from a configuration read earlier (Platform::GetSystemFontFamilies),
+// so that a caller can read it before taking a lock on the manager.
+bool InstallSystemFontFamilies(FontManager* manager, const std::vector<Platform::SystemFontFamily>& config);
 
 }  // namespace Glimmer

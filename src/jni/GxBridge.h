@@ -84,4 +84,28 @@ jboolean GxText_SetFont(JNIEnv* env, jobject thiz, jstring fontFile);
 jboolean GxText_SetFont2(JNIEnv* env, jobject thiz, jstring fontName, jbyteArray buffer);
 jboolean GxText_SetFont3(JNIEnv* env, jobject thiz, jobject assetManager, jstring fontName);
 
+// Natives registered each on its own, after the table above: a Java layer
+// that lacks one still gets all the others. They start with a clear reason
+// and leave one on every failure (Error::GetReason).
+jstring Error_GetReason(JNIEnv* env, jclass cls);
+jboolean GxFontManager_InstallSystemFontFamilies(JNIEnv* env, jclass cls);
+jint GxText_AddInnerGlowTextEffect(JNIEnv* env, jobject thiz, jfloat size, jint color, jfloat opacity,
+                                   jintArray colors, jfloatArray opacities, jfloatArray positions);
+jint GxText_AddOuterGlowGradientTextEffect(JNIEnv* env, jobject thiz, jfloat size, jint color, jfloat opacity,
+                                           jintArray colors, jfloatArray opacities, jfloatArray positions);
+jint GxText_AddRadialGradientTextEffect(JNIEnv* env, jobject thiz, jfloat scale, jintArray colors,
+                                        jfloatArray opacities, jfloatArray positions, jfloat opacity);
+jint GxText_AddPatternTextEffect(JNIEnv* env, jobject thiz, jintArray pixels, jint width, jint height,
+                                 jfloat scale, jfloat opacity);
+jint GxText_AddBevelTextEffect(JNIEnv* env, jobject thiz, jint style, jfloat depth, jfloat size, jint direction,
+                               jint technique, jint soften, jfloat opacity, jfloat angle, jfloat altitude,
+                               jint highlightColor, jfloat highlightOpacity, jint shadowColor,
+                               jfloat shadowOpacity);
+jint GxText_AddEmbossTextEffect(JNIEnv* env, jobject thiz, jint style, jfloat depth, jfloat size, jint direction,
+                                jint technique, jint soften, jfloat opacity, jfloat angle, jfloat altitude,
+                                jint highlightColor, jfloat highlightOpacity, jint shadowColor,
+                                jfloat shadowOpacity);
+jboolean GxText_SetTextOpacity(JNIEnv* env, jobject thiz, jfloat opacity);
+jboolean GxText_SetLayerStyle(JNIEnv* env, jobject thiz, jboolean on);
+
 }  // namespace Glimmer

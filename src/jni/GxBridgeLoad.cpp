@@ -12,8 +12,17 @@
 //
 // The error class also tells the log, once per process, whether this is an
 // engineering build (all logging on), through its static isBuildTypeEngMode.
+//
+// Natives that came after the first Java layer (more effect kinds, the
+// layer-style switch, failure reasons, the system's fonts on Linux) are
+// registered afterwards, each on its own. A Java class that lacks one (an
+// older Java layer) gets all the others: its NoSuchMethodError is cleared
+// and one debug line names the native. The first three steps, and their
+// log, are untouched by them.
 
 #include <jni.h>
+
+#include <cstring>
 
 #include "foundation/Error.h"
 #include "foundation/GxLog.h"
@@ -67,6 +76,26 @@ constexpr jint kErrorNatives = 1;
 constexpr jint kFontManagerNatives = 2;
 constexpr jint kTextNatives = 20;
 static_assert(sizeof kNatives / sizeof kNatives[0] == kErrorNatives + kFontManagerNatives + kTextNatives);
+
+struct OptionalNative {
+    const char* className;
+    JNINativeMethod method;
+};
+
+const OptionalNative kOptionalNatives[] = {
+    {kErrorClass, Native("Error_GetReason", "()Ljava/lang/String;", Error_GetReason)},
+    {kFontManagerClass,
+     Native("GxFontManager_InstallSystemFontFamilies", "()Z", GxFontManager_InstallSystemFontFamilies)},
+    {kTextClass, Native("GxText_AddInnerGlowTextEffect", "(FIF[I[F[F)I", GxText_AddInnerGlowTextEffect)},
+    {kTextClass,
+     Native("GxText_AddOuterGlowGradientTextEffect", "(FIF[I[F[F)I", GxText_AddOuterGlowGradientTextEffect)},
+    {kTextClass, Native("GxText_AddRadialGradientTextEffect", "(F[I[F[FF)I", GxText_AddRadialGradientTextEffect)},
+    {kTextClass, Native("GxText_AddPatternTextEffect", "([IIIFF)I", GxText_AddPatternTextEffect)},
+    {kTextClass, Native("GxText_AddBevelTextEffect", "(IFFIIIFFFIFIF)I", GxText_AddBevelTextEffect)},
+    {kTextClass, Native("GxText_AddEmbossTextEffect", "(IFFIIIFFFIFIF)I", GxText_AddEmbossTextEffect)},
+    {kTextClass, Native("GxText_SetTextOpacity", "(F)Z", GxText_SetTextOpacity)},
+    {kTextClass, Native("GxText_SetLayerStyle", "(Z)Z", GxText_SetLayerStyle)},
+};
 
 // Kept by the load functions for the life of the process.
 JavaVM* gVm = nullptr;
@@ -139,11 +168,36 @@ bool GxText_OnLoad(JavaVM* vm, JNIEnv* env) {
     return true;
 }
 
+// Registers every optional native whose Java method exists. A missing class
+// was reported by its own step already.
+void RegisterOptionalNatives(JNIEnv* env, jthrowable* deferred) {
+    for (const char* className : {kErrorClass, kFontManagerClass, kTextClass}) {
+        Jni::LocalRef<jclass> cls(env, env->FindClass(className));
+        if (!cls) {
+            Jni::ClearException(env);
+            continue;
+        }
+        for (const OptionalNative& native : kOptionalNatives) {
+            if (std::strcmp(native.className, className) != 0) continue;
+            if (env->RegisterNatives(cls.get(), &native.method, 1) < 0) {
+                Platform::LogPrint(Platform::kLogDebug, kCommonTag, "%s %s: not in %s, not registered",
+                                   native.method.name, native.method.signature, className);
+                HandleException(env, deferred);
+            }
+        }
+    }
+}
+
 }  // namespace
 
 jint Error_GetError(JNIEnv*, jclass) {
     Platform::LogPrint(Platform::kLogDebug, Bridge::kErrorTag, "Error_GetError");
     return Error::GetError();
+}
+
+jstring Error_GetReason(JNIEnv* env, jclass) {
+    const char* reason = Error::GetReason();
+    return reason[0] != '\0' ? Jni::NewStringFromUtf8(env, reason) : nullptr;
 }
 
 }  // namespace Glimmer
@@ -167,6 +221,7 @@ extern "C" JNIEXPORT jint JNICALL JNI_OnLoad(JavaVM* vm, void*) {
         Platform::LogPrint(Platform::kLogError, kCommonTag, "GxText OnLoad Fail!");
         HandleException(env, &deferred);
     }
+    RegisterOptionalNatives(env, &deferred);
     if (deferred != nullptr) {
         env->Throw(deferred);
         env->DeleteGlobalRef(deferred);

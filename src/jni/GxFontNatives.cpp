@@ -17,6 +17,15 @@
 // Font bytes are always copied out of the Java array (nothing stays pinned)
 // into a new[] array that the font manager takes, on success and failure
 // alike. Asset bytes are read the same way.
+//
+// Every native here starts the thread's reason afresh and leaves one on
+// each failure (a file that is missing, unreadable or no font, a null
+// argument, a missing asset), so Java can tell why a call returned false.
+//
+// On Linux the system's own families can be installed instead of a Java
+// font configuration (GxFontManager_InstallSystemFontFamilies): read from
+// fontconfig and laid out as a device hands them over, then converted by
+// the same rules; the first set of families wins either way.
 
 #include <jni.h>
 
@@ -28,6 +37,7 @@
 
 #include "font/FontManager.h"
 #include "font/SystemFontFamilies.h"
+#include "foundation/Error.h"
 #include "foundation/GxLog.h"
 #include "foundation/List.h"
 #include "jni/GxBridge.h"
@@ -188,22 +198,29 @@ char* ReadAsset(Platform::Asset& asset, unsigned* size) {
 
 jboolean GxFontManager_InsertFontData(JNIEnv* env, jclass, jstring fontName, jbyteArray buffer) {
     LogPrint(kLogDebug, kManagerTag, "GxFontManager_InsertFontData");
+    Error::ClearReason();
     if (fontName == nullptr) {
         LogPrint(kLogError, kManagerTag, "GxFontManager_InsertFontData() - fontName is NULL");
+        Error::SetReason("no font name was given (null)");
         return JNI_FALSE;
     }
     if (buffer == nullptr) {
         LogPrint(kLogError, kManagerTag, "GxFontManager_InsertFontData() - buffer is NULL");
+        Error::SetReason("no font bytes were given (null)");
         return JNI_FALSE;
     }
     Jni::Utf8Chars name(env, fontName);
     if (name.get() == nullptr) {
         LogPrint(kLogError, kManagerTag, "GxFontManager_InsertFontData() - Fail to get fontFile string");
+        Error::SetReason("the font name could not be read from Java");
         return JNI_FALSE;
     }
     jsize length = 0;
     char* copy = CopyBytes(env, buffer, &length);
-    if (copy == nullptr) return JNI_FALSE;
+    if (copy == nullptr) {
+        Error::SetReason("no memory for a copy of the font's %d bytes", int(length));
+        return JNI_FALSE;
+    }
     std::unique_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
     // A font already known under the name is kept; the copy is then freed.
     return FontManager::GetInstance()->AddMinikinFont(name.get(), copy, unsigned(length), 0, true);
@@ -212,6 +229,7 @@ jboolean GxFontManager_InsertFontData(JNIEnv* env, jclass, jstring fontName, jby
 jboolean GxFontManager_SetFontConfig(JNIEnv* env, jclass, jobject fontConfig) {
     const bool verbose = GxLog::IsAllLogEnable();
     if (verbose) LogPrint(kLogDebug, kManagerTag, "GxFontManager_SetFontConfig()");
+    Error::ClearReason();
     FontManager* manager = FontManager::GetInstance();
     {
         std::shared_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
@@ -222,12 +240,14 @@ jboolean GxFontManager_SetFontConfig(JNIEnv* env, jclass, jobject fontConfig) {
     }
     if (fontConfig == nullptr) {
         LogPrint(kLogError, kManagerTag, "GxFontManager_SetFontConfig - jFontConfig is NULL");
+        Error::SetReason("no font configuration was given (null)");
         return JNI_FALSE;
     }
 
     auto* families = new (std::nothrow) List();
     if (families == nullptr || !families->Construct()) {
         delete families;
+        Error::SetReason("no memory for the font families");
         return JNI_FALSE;
     }
     if (verbose) LogPrint(kLogDebug, kManagerTag, "GxFontManager_SetFontConfig >>> ConvertToFontFamilies");
@@ -243,6 +263,8 @@ jboolean GxFontManager_SetFontConfig(JNIEnv* env, jclass, jobject fontConfig) {
     converted = converted && ConvertToFontFamilies(manager, config, families);
     if (!converted) {
         LogPrint(kLogError, kManagerTag, "GxFontManager_SetFontConfig - cannot convert to native families");
+        // A missing method or a Java exception has said which already.
+        if (Error::GetReason()[0] == '\0') Error::SetReason("the font configuration could not be converted");
         DeleteFamilies(families);
         return JNI_FALSE;
     }
@@ -255,11 +277,14 @@ jboolean GxFontManager_SetFontConfig(JNIEnv* env, jclass, jobject fontConfig) {
 }
 
 jboolean GxText_SetFont(JNIEnv* env, jobject thiz, jstring fontFile) {
+    Error::ClearReason();
     GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
     if (object == nullptr) return JNI_FALSE;
     Jni::Utf8Chars path(env, fontFile);
     if (path.get() == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont() - Fail to get fontFile string");
+        Error::SetReason(fontFile == nullptr ? "no font path was given (null)"
+                                             : "the font path could not be read from Java");
         return JNI_FALSE;
     }
     std::unique_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
@@ -267,42 +292,53 @@ jboolean GxText_SetFont(JNIEnv* env, jobject thiz, jstring fontFile) {
 }
 
 jboolean GxText_SetFont2(JNIEnv* env, jobject thiz, jstring fontName, jbyteArray buffer) {
+    Error::ClearReason();
     GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
     if (object == nullptr) return JNI_FALSE;
     if (fontName == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont2() - fontName is NULL");
+        Error::SetReason("no font name was given (null)");
         return JNI_FALSE;
     }
     if (buffer == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont2() - buffer is NULL");
+        Error::SetReason("no font bytes were given (null)");
         return JNI_FALSE;
     }
     Jni::Utf8Chars name(env, fontName);
     if (name.get() == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont2() - Fail to get fontFile string");
+        Error::SetReason("the font name could not be read from Java");
         return JNI_FALSE;
     }
     jsize length = 0;
     char* copy = CopyBytes(env, buffer, &length);
-    if (copy == nullptr) return JNI_FALSE;
+    if (copy == nullptr) {
+        Error::SetReason("no memory for a copy of the font's %d bytes", int(length));
+        return JNI_FALSE;
+    }
     std::unique_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
     return object->SetFont(name.get(), copy, unsigned(length));
 }
 
 jboolean GxText_SetFont3(JNIEnv* env, jobject thiz, jobject assetManager, jstring fontName) {
+    Error::ClearReason();
     GxTextObject* object = Bridge::RequireBoundTextObject(env, thiz);
     if (object == nullptr) return JNI_FALSE;
     if (assetManager == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont3() - assetManager is NULL");
+        Error::SetReason("no asset manager was given (null)");
         return JNI_FALSE;
     }
     if (fontName == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont3() - fontName is NULL");
+        Error::SetReason("no asset name was given (null)");
         return JNI_FALSE;
     }
     Jni::Utf8Chars name(env, fontName);
     if (name.get() == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont3() - Fail to get fontFile string");
+        Error::SetReason("the asset name could not be read from Java");
         return JNI_FALSE;
     }
     {
@@ -314,6 +350,7 @@ jboolean GxText_SetFont3(JNIEnv* env, jobject thiz, jobject assetManager, jstrin
     std::unique_ptr<Platform::Asset> asset = assets != nullptr ? assets->Open(name.get()) : nullptr;
     if (asset == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont3() - _ASSET_NOT_FOUND_");
+        Error::SetReason("%s: no such asset", name.get());
         return JNI_FALSE;
     }
     unsigned size = 0;
@@ -321,10 +358,34 @@ jboolean GxText_SetFont3(JNIEnv* env, jobject thiz, jobject assetManager, jstrin
     asset.reset();
     if (bytes == nullptr) {
         LogPrint(kLogError, kTextTag, "GxText_SetFont3() - Fail to read the asset");
+        Error::SetReason("%s: the asset could not be read", name.get());
         return JNI_FALSE;
     }
     std::unique_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
     return object->SetFont(name.get(), bytes, size);
+}
+
+jboolean GxFontManager_InstallSystemFontFamilies(JNIEnv*, jclass) {
+    Error::ClearReason();
+    FontManager* manager = FontManager::GetInstance();
+    {
+        std::shared_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
+        if (manager->IsSystemFontFamiliesAlreadySet()) return JNI_TRUE;
+    }
+    // Asking the system takes a while the first time; renders go on meanwhile.
+    const std::vector<Platform::SystemFontFamily> config = Platform::GetSystemFontFamilies();
+    if (config.empty()) {
+        LogPrint(kLogError, kManagerTag, "GxFontManager_InstallSystemFontFamilies - no system font families");
+        Error::SetReason("the system's font configuration lists no usable font families");
+        return JNI_FALSE;
+    }
+    std::unique_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
+    if (!InstallSystemFontFamilies(manager, config)) {
+        LogPrint(kLogError, kManagerTag, "GxFontManager_InstallSystemFontFamilies - cannot convert to native families");
+        Error::SetReason("the system's font families could not be converted");
+        return JNI_FALSE;
+    }
+    return JNI_TRUE;
 }
 
 }  // namespace Glimmer

@@ -1,10 +1,16 @@
 // Effects and rendering from Java.
 //
 // The effect natives pass their arguments through to the text's effect stack
-// and return the new layer's id, or -1. The linear gradient takes its stops
-// as three parallel arrays (colours, opacities, positions); arrays of
-// different lengths are refused without a word, and an empty set of stops
-// is passed on as it is.
+// and return the new layer's id, or -1. Colour ramps come as three parallel
+// arrays (colours, opacities, positions); arrays of different lengths are
+// refused without a log line (the thread's reason says why), and an empty
+// set of stops is passed on as it is. A pattern tile comes as 0xAARRGGBB
+// words, straight alpha, row by row, as a Java bitmap hands its pixels out.
+//
+// Beside the effect kinds the first Java layer knew (outer and inner shadow,
+// outer glow, stroke, linear gradient), natives registered on their own add
+// the others, a glow with a colour ramp, the stack's text opacity and its
+// layer-style switch; a Java layer without them loads and works as before.
 //
 // A render draws a picture larger than the view by the effect stack's four
 // margins, so effects that reach past the text are not cut off; the text's
@@ -14,9 +20,11 @@
 #include <jni.h>
 
 #include <climits>
+#include <memory>
 #include <mutex>
 #include <new>
 
+#include "effect/GxECoreBase.h"
 #include "effect/GxEffect.h"
 #include "effect/GxProperty.h"
 #include "foundation/Error.h"
@@ -42,6 +50,76 @@ GxEffect* BoundEffect(JNIEnv* env, jobject thiz, const char* missingMessage) {
     GxEffect* effect = object->GetEffect();
     if (effect == nullptr && missingMessage != nullptr) LogPrint(kLogError, kTag, "%s", missingMessage);
     return effect;
+}
+
+// Stops read from three parallel Java arrays.
+struct Stops {
+    std::unique_ptr<GxGradient[]> items;
+    jsize count = 0;
+
+    const GxGradient* data() const { return items.get(); }
+};
+
+// False (with the thread's reason, and no log line) for a null array, arrays
+// of different lengths, or no memory. `what` names the effect in the reason.
+bool ReadStops(JNIEnv* env, jintArray colors, jfloatArray opacities, jfloatArray positions, const char* what,
+               Stops* out) {
+    if (colors == nullptr || opacities == nullptr || positions == nullptr) {
+        Error::SetReason("%s: a colour, opacity or position array of the stops is null", what);
+        return false;
+    }
+    const jsize count = env->GetArrayLength(colors);
+    if (env->GetArrayLength(opacities) != count || env->GetArrayLength(positions) != count) {
+        Error::SetReason("%s: the stops have %d colours, %d opacities and %d positions", what, int(count),
+                         int(env->GetArrayLength(opacities)), int(env->GetArrayLength(positions)));
+        return false;
+    }
+    if (count == 0) return true;
+    // Copies of the arrays, read one stop at a time; nothing is pinned.
+    out->items.reset(new (std::nothrow) GxGradient[size_t(count)]);
+    std::unique_ptr<jint[]> c(new (std::nothrow) jint[size_t(count)]);
+    std::unique_ptr<jfloat[]> o(new (std::nothrow) jfloat[size_t(count)]);
+    std::unique_ptr<jfloat[]> p(new (std::nothrow) jfloat[size_t(count)]);
+    if (!out->items || !c || !o || !p) {
+        Error::SetReason("%s: no memory for %d stops", what, int(count));
+        return false;
+    }
+    env->GetIntArrayRegion(colors, 0, count, c.get());
+    env->GetFloatArrayRegion(opacities, 0, count, o.get());
+    env->GetFloatArrayRegion(positions, 0, count, p.get());
+    for (jsize i = 0; i < count; ++i) out->items[i] = GxGradient{uint32_t(c[i]), o[i], p[i]};
+    out->count = count;
+    return true;
+}
+
+// The effect stack of the Java object's text for a native registered on its
+// own: the thread's reason is its own from the start.
+GxEffect* EffectForNewNative(JNIEnv* env, jobject thiz) {
+    Error::ClearReason();
+    GxEffect* effect = BoundEffect(env, thiz, nullptr);
+    if (effect == nullptr && Error::GetReason()[0] == '\0') Error::SetReason("the text has no effect stack");
+    return effect;
+}
+
+// The id of a layer the stack took, or -1 with the thread's reason.
+jint Added(int id, const char* what) {
+    if (id < 0) Error::SetReason("%s: the effect stack refused the layer", what);
+    return id;
+}
+
+jint AddGlow(JNIEnv* env, jobject thiz, int kind, jfloat size, jint color, jfloat opacity, jintArray colors,
+             jfloatArray opacities, jfloatArray positions) {
+    const char* what = kind == GxECore::kInnerGlow ? "inner glow" : "outer glow";
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return -1;
+    Stops stops;
+    // A glow without a ramp takes its one colour.
+    const bool ramp = colors != nullptr || opacities != nullptr || positions != nullptr;
+    if (ramp && !ReadStops(env, colors, opacities, positions, what, &stops)) return -1;
+    const int id = kind == GxECore::kInnerGlow
+                       ? effect->addInnerGlowText(size, unsigned(color), opacity, stops.count, stops.data())
+                       : effect->addOuterGlowText(size, unsigned(color), opacity, stops.count, stops.data());
+    return Added(id, what);
 }
 
 jint Offset(JNIEnv* env, jobject thiz, int (GxEffect::*side)()) {
@@ -95,37 +173,112 @@ jint GxText_AddLinearGradientTextEffect(JNIEnv* env, jobject thiz, jfloat angle,
                                         jfloatArray positions, jfloat opacity) {
     GxEffect* effect = BoundEffect(env, thiz, "GxText_AddLinearGradientTextEffect() effect is NULL");
     if (effect == nullptr) return -1;
-    if (colors == nullptr || opacities == nullptr || positions == nullptr) return -1;
-    const jsize count = env->GetArrayLength(colors);
-    if (env->GetArrayLength(opacities) != count || env->GetArrayLength(positions) != count) return -1;
-
-    GxGradient* stops = nullptr;
-    if (count > 0) {
-        stops = new (std::nothrow) GxGradient[size_t(count)];
-        if (stops == nullptr) return -1;
-        // Copies of the arrays, read one stop at a time; nothing is pinned.
-        auto* c = new (std::nothrow) jint[size_t(count)];
-        auto* o = new (std::nothrow) jfloat[size_t(count)];
-        auto* p = new (std::nothrow) jfloat[size_t(count)];
-        bool copied = c != nullptr && o != nullptr && p != nullptr;
-        if (copied) {
-            env->GetIntArrayRegion(colors, 0, count, c);
-            env->GetFloatArrayRegion(opacities, 0, count, o);
-            env->GetFloatArrayRegion(positions, 0, count, p);
-            for (jsize i = 0; i < count; ++i) stops[i] = GxGradient{uint32_t(c[i]), o[i], p[i]};
-        }
-        delete[] c;
-        delete[] o;
-        delete[] p;
-        if (!copied) {
-            delete[] stops;
-            return -1;
-        }
-    }
+    Stops stops;
+    if (!ReadStops(env, colors, opacities, positions, "linear gradient", &stops)) return -1;
     // The last Java float is the stack's third argument, the layer opacity.
-    jint id = effect->addLinearGradientText(angle, scale, opacity, count, stops);
-    delete[] stops;
-    return id;
+    return effect->addLinearGradientText(angle, scale, opacity, stops.count, stops.data());
+}
+
+jint GxText_AddInnerGlowTextEffect(JNIEnv* env, jobject thiz, jfloat size, jint color, jfloat opacity,
+                                   jintArray colors, jfloatArray opacities, jfloatArray positions) {
+    return AddGlow(env, thiz, GxECore::kInnerGlow, size, color, opacity, colors, opacities, positions);
+}
+
+jint GxText_AddOuterGlowGradientTextEffect(JNIEnv* env, jobject thiz, jfloat size, jint color, jfloat opacity,
+                                           jintArray colors, jfloatArray opacities, jfloatArray positions) {
+    return AddGlow(env, thiz, GxECore::kOuterGlow, size, color, opacity, colors, opacities, positions);
+}
+
+jint GxText_AddRadialGradientTextEffect(JNIEnv* env, jobject thiz, jfloat scale, jintArray colors,
+                                        jfloatArray opacities, jfloatArray positions, jfloat opacity) {
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return -1;
+    Stops stops;
+    if (!ReadStops(env, colors, opacities, positions, "radial gradient", &stops)) return -1;
+    return Added(effect->addRadialGradientText(scale, opacity, stops.count, stops.data()), "radial gradient");
+}
+
+jint GxText_AddPatternTextEffect(JNIEnv* env, jobject thiz, jintArray pixels, jint width, jint height,
+                                 jfloat scale, jfloat opacity) {
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return -1;
+    if (pixels == nullptr) {
+        Error::SetReason("pattern: the tile has no pixels (null)");
+        return -1;
+    }
+    size_t bytes = 0;
+    if (width <= 0 || height <= 0 || !GxBitmap::PixelBytes(unsigned(width), unsigned(height), 4, &bytes)) {
+        Error::SetReason("pattern: a tile of %d x %d pixels cannot be made", int(width), int(height));
+        return -1;
+    }
+    const jsize length = env->GetArrayLength(pixels);
+    const int64_t count = int64_t(width) * int64_t(height);
+    if (int64_t(length) < count) {
+        Error::SetReason("pattern: %d pixels are too few for a tile of %d x %d", int(length), int(width),
+                         int(height));
+        return -1;
+    }
+    std::unique_ptr<GxBitmap> tile(new (std::nothrow) GxBitmap(unsigned(width), unsigned(height), 4));
+    if (tile == nullptr || tile->pixels == nullptr) {
+        Error::SetReason("pattern: no memory for a tile of %d x %d", int(width), int(height));
+        return -1;
+    }
+    // The pattern layer reads the bytes alpha, red, green, blue of each pixel:
+    // the words' bytes from the most significant down.
+    unsigned char* out = tile->pixels;
+    jint row[256];
+    for (int64_t done = 0; done < count;) {
+        const jsize n = jsize(count - done < 256 ? count - done : 256);
+        env->GetIntArrayRegion(pixels, jsize(done), n, row);
+        for (jsize i = 0; i < n; ++i, out += 4) {
+            const uint32_t c = uint32_t(row[i]);
+            out[0] = uint8_t(c >> 24);
+            out[1] = uint8_t(c >> 16);
+            out[2] = uint8_t(c >> 8);
+            out[3] = uint8_t(c);
+        }
+        done += n;
+    }
+    // The layer keeps its own copy of the tile.
+    return Added(effect->addPatternText(tile.get(), scale, opacity), "pattern");
+}
+
+jint GxText_AddBevelTextEffect(JNIEnv* env, jobject thiz, jint style, jfloat depth, jfloat size, jint direction,
+                               jint technique, jint soften, jfloat opacity, jfloat angle, jfloat altitude,
+                               jint highlightColor, jfloat highlightOpacity, jint shadowColor,
+                               jfloat shadowOpacity) {
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return -1;
+    return Added(effect->addBevelText(style, depth, size, direction, technique, soften, opacity, angle, altitude,
+                                      unsigned(highlightColor), highlightOpacity, unsigned(shadowColor),
+                                      shadowOpacity),
+                 "bevel");
+}
+
+jint GxText_AddEmbossTextEffect(JNIEnv* env, jobject thiz, jint style, jfloat depth, jfloat size, jint direction,
+                                jint technique, jint soften, jfloat opacity, jfloat angle, jfloat altitude,
+                                jint highlightColor, jfloat highlightOpacity, jint shadowColor,
+                                jfloat shadowOpacity) {
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return -1;
+    return Added(effect->addEmbossText(style, depth, size, direction, technique, soften, opacity, angle, altitude,
+                                       unsigned(highlightColor), highlightOpacity, unsigned(shadowColor),
+                                       shadowOpacity),
+                 "emboss");
+}
+
+jboolean GxText_SetTextOpacity(JNIEnv* env, jobject thiz, jfloat opacity) {
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return JNI_FALSE;
+    effect->setTextOpacity(opacity);
+    return JNI_TRUE;
+}
+
+jboolean GxText_SetLayerStyle(JNIEnv* env, jobject thiz, jboolean on) {
+    GxEffect* effect = EffectForNewNative(env, thiz);
+    if (effect == nullptr) return JNI_FALSE;
+    effect->setLayerStyle(on != JNI_FALSE);
+    return JNI_TRUE;
 }
 
 void GxText_ClearAllTextEffect(JNIEnv* env, jobject thiz) {

@@ -19,6 +19,11 @@ namespace Glimmer::Jni {
 // Clears a pending exception; true when there was one.
 bool ClearException(JNIEnv* env);
 
+// A new Java string of UTF-8 text (modified UTF-8 too); bytes that are not
+// well-formed become U+FFFD. Null when the JVM could not make it (the
+// OutOfMemoryError is cleared).
+jstring NewStringFromUtf8(JNIEnv* env, const char* utf8);
+
 // A local reference deleted at the end of its scope.
 template <typename T = jobject>
 class LocalRef {
@@ -63,8 +68,8 @@ struct MethodSpec {
 
 // Looks up every method of `specs` on `cls`, in order, into `ids`. At the
 // first one missing, clears the NoSuchMethodError, logs `notFoundFormat`
-// (one %s: the method's name) at error priority under `tag` and returns
-// false.
+// (one %s: the method's name) at error priority under `tag`, leaves the
+// thread a reason naming the method and returns false.
 bool LookUpMethods(JNIEnv* env, jclass cls, const MethodSpec* specs, size_t count, jmethodID* ids,
                    const char* tag, const char* notFoundFormat);
 
@@ -73,7 +78,8 @@ bool LookUpMethods(JNIEnv* env, jclass cls, const MethodSpec* specs, size_t coun
 jmethodID FindMethod(JNIEnv* env, jobject object, const char* name, const char* signature);
 
 // Calls into Java for one native. The first call that throws is logged once
-// under `tag` as "<context> - Java exception", the exception is cleared and
+// under `tag` as "<context> - Java exception" (and left as the thread's
+// reason with the exception's class), the exception is cleared and
 // every later call through this object is skipped (returning 0 or null), so
 // a native can read all it needs and then ask Failed() once before it
 // changes anything.

@@ -93,6 +93,30 @@ public class GxText implements AutoCloseable {
 
     native int GxText_GetEffectBottomOffset();
 
+    // Natives of a later library version, each registered on its own.
+    native int GxText_AddInnerGlowTextEffect(float size, int color, float opacity, int[] colors,
+            float[] opacities, float[] positions);
+
+    native int GxText_AddOuterGlowGradientTextEffect(float size, int color, float opacity, int[] colors,
+            float[] opacities, float[] positions);
+
+    native int GxText_AddRadialGradientTextEffect(float scale, int[] colors, float[] opacities,
+            float[] positions, float opacity);
+
+    native int GxText_AddPatternTextEffect(int[] pixels, int width, int height, float scale, float opacity);
+
+    native int GxText_AddBevelTextEffect(int style, float depth, float size, int direction, int technique,
+            int soften, float opacity, float angle, float altitude, int highlightColor, float highlightOpacity,
+            int shadowColor, float shadowOpacity);
+
+    native int GxText_AddEmbossTextEffect(int style, float depth, float size, int direction, int technique,
+            int soften, float opacity, float angle, float altitude, int highlightColor, float highlightOpacity,
+            int shadowColor, float shadowOpacity);
+
+    native boolean GxText_SetTextOpacity(float opacity);
+
+    native boolean GxText_SetLayerStyle(boolean on);
+
     /** Text size, scale, skew, letter spacing, flags, font features, locales and alignment of the paint. */
     public synchronized boolean setPaint(Paint paint) {
         checkOpen();

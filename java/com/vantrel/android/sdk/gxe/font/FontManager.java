@@ -18,6 +18,8 @@ public final class FontManager {
 
     static native boolean GxFontManager_SetFontConfig(FontConfig fontConfig);
 
+    static native boolean GxFontManager_InstallSystemFontFamilies();
+
     /**
      * Makes the font in {@code data} (a TrueType or OpenType file, first face) known under {@code name}.
      * The bytes are copied. A font already known under the name is kept, and the call succeeds.

@@ -26,6 +26,9 @@ public final class GxError {
     /** The last error code set on the calling thread (registered by the library). */
     static native int Error_GetError();
 
+    /** The reason of the last failure on the calling thread, or null (registered by the library). */
+    static native String Error_GetReason();
+
     /**
      * Whether this is an engineering build, in which the library writes all its diagnostic log lines. Asked
      * once, when the library loads; here the system property {@code gxe.engMode}.
