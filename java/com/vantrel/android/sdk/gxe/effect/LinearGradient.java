@@ -1,7 +1,5 @@
 package com.vantrel.android.sdk.gxe.effect;
 
-import java.util.Arrays;
-
 /**
  * Parameters of a linear gradient fill of the glyphs.
  *
@@ -13,17 +11,18 @@ import java.util.Arrays;
  *
  * <p>Stops are given in order of position; each has its own colour (alpha byte ignored), opacity (0..1)
  * and position (0..1, taken to two decimals). The angle is taken in whole degrees modulo 360, the scale
- * within 0..2.
+ * within 0..2 (below 0.1 nothing is drawn). The opacity of the whole fill scales every stop's own.
  */
 public final class LinearGradient {
     private float angle = 90f;
     private float scale = 1f;
     private float opacity = 1f;
-    private int[] colors = new int[0];
-    private float[] opacities = new float[0];
-    private float[] positions = new float[0];
+    private final Stops stops = new Stops();
 
-    /** Direction of the gradient, in degrees. */
+    /**
+     * Direction of the gradient, in degrees: 0 runs from the first stop on the left to the last on the
+     * right, 90 from the bottom up.
+     */
     public LinearGradient angle(float degrees) {
         this.angle = degrees;
         return this;
@@ -43,13 +42,7 @@ public final class LinearGradient {
 
     /** Appends a stop: colour as 0xRRGGBB, its opacity, its position along the gradient (0..1). */
     public LinearGradient stop(int rgb, float opacity, float position) {
-        int n = colors.length;
-        colors = Arrays.copyOf(colors, n + 1);
-        opacities = Arrays.copyOf(opacities, n + 1);
-        positions = Arrays.copyOf(positions, n + 1);
-        colors[n] = rgb;
-        opacities[n] = opacity;
-        positions[n] = position;
+        stops.add(rgb, opacity, position);
         return this;
     }
 
@@ -67,16 +60,16 @@ public final class LinearGradient {
 
     /** Colours of the stops (a copy). */
     public int[] getColors() {
-        return colors.clone();
+        return stops.colors();
     }
 
     /** Opacities of the stops (a copy). */
     public float[] getOpacities() {
-        return opacities.clone();
+        return stops.opacities();
     }
 
     /** Positions of the stops (a copy). */
     public float[] getPositions() {
-        return positions.clone();
+        return stops.positions();
     }
 }

@@ -9,7 +9,9 @@ import com.vantrel.android.sdk.gxe.util.NativeLibrary;
  * <p>{@link #setFontConfig(FontConfig)} hands over the device's font families once per process; they are
  * the fallbacks for every text. {@link #insertFontData(String, byte[])} makes a font known under a name,
  * which texts can then choose with {@link com.vantrel.android.sdk.gxe.GxText#setFont(String)}. Fonts stay
- * loaded for the life of the process.
+ * loaded for the life of the process. In a plain JVM on Linux, {@link SystemFonts#install()} hands over
+ * the system's own families instead of a configuration. When a call returns false,
+ * {@link com.vantrel.android.sdk.gxe.util.GxError#getLastReason()} tells why.
  */
 public final class FontManager {
     private FontManager() {}

@@ -128,24 +128,37 @@ public class BindingTest {
         other.close();
     }
 
-    @Test
-    public void closeReleasesOnceAndTheFinaliserAfterItIsHarmless() throws Throwable {
+    /** A text bound, rendered with a stroke and closed; its handle. */
+    private static int closedText() {
         GxText text = new GxText();
         text.addStroke(new Stroke());
         int handle = Fixtures.handleOf(text);
         text.close();
         Check.isTrue(text.isClosed(), "closed");
         text.close();
-        List<String> log = LogTap.capture(() -> {
-            try {
-                text.finalize();
-            } catch (Throwable t) {
-                throw new AssertionError(t);
-            }
-        });
-        Check.equal(0, LogTap.count(log, "D/GxText_JNI: finalize"), "finaliser after close " + log);
         Check.equal(handle, Fixtures.handleOf(text), "handle");
         Check.raises(IllegalStateException.class, () -> text.setLineLimit(1), "closed text");
         Check.raises(IllegalStateException.class, text::render, "closed text");
+        return handle;
+    }
+
+    /** A text bound and dropped without closing; its handle. */
+    private static int droppedText() {
+        GxText text = new GxText();
+        text.addStroke(new Stroke());
+        return Fixtures.handleOf(text);
+    }
+
+    @Test
+    public void closeReleasesOnceAndAnUnclosedTextIsReleasedWhenUnreachable() {
+        int[] handles = new int[2];
+        List<String> log = LogTap.capture(() -> {
+            handles[0] = closedText();
+            handles[1] = droppedText();
+            Fixtures.awaitRelease(handles[1]);
+            Fixtures.awaitRelease(handles[0]);
+        });
+        Check.equal(1, LogTap.count(log, "D/GxText_JNI: finalize : RH " + handles[0]), "closed: " + log);
+        Check.equal(1, LogTap.count(log, "D/GxText_JNI: finalize : RH " + handles[1]), "dropped: " + log);
     }
 }

@@ -90,6 +90,17 @@ final class Fixtures {
         return inkBox(p.getPixels(), p.getWidth(), p.getHeight());
     }
 
+    /** The pixels of the view's own area of a picture (the effect margins cut off), row by row. */
+    static int[] viewPixels(GxText.Picture p, int viewWidth, int viewHeight) {
+        int[] pixels = new int[viewWidth * viewHeight];
+        for (int y = 0; y < viewHeight; y++) {
+            for (int x = 0; x < viewWidth; x++) {
+                pixels[y * viewWidth + x] = p.getPixel(x + p.getLeft(), y + p.getTop());
+            }
+        }
+        return pixels;
+    }
+
     /**
      * Where a 20-pixel BLOCK drawn with its pen at (0, 0) puts ink: {left, top, right, bottom}, measured once
      * from a plain render with the baseline at 30. Placement tests compare against it, so they check where
@@ -124,6 +135,58 @@ final class Fixtures {
             }
         }
         return false;
+    }
+
+    /** Whether no native text has this handle (any more). */
+    static boolean isReleased(int handle) {
+        GxText probe = new GxText();
+        setHandle(probe, handle);
+        try {
+            return errorAfter(() -> probe.GxText_SetLine(1)) == com.vantrel.android.sdk.gxe.util.GxError.NOT_BOUND;
+        } finally {
+            setHandle(probe, -1);
+            probe.close();
+        }
+    }
+
+    /** Collects garbage until the native text of `handle` is released; fails after a few seconds. */
+    static void awaitRelease(int handle) {
+        for (int round = 0; round < 400; round++) {
+            if (isReleased(handle)) {
+                return;
+            }
+            System.gc();
+            try {
+                Thread.sleep(10);
+            } catch (InterruptedException e) {
+                throw new AssertionError(e);
+            }
+        }
+        throw new AssertionError("native text " + handle + " was never released");
+    }
+
+    /** What a call left on a fresh thread: its result, and the thread's reason and error code after it. */
+    static final class Outcome {
+        Object result;
+        String reason;
+        int code;
+
+        /** Checks that the call failed with `expected` as its result, a reason saying `words` and `code`. */
+        void failed(Object expected, String words, int expectedCode, String what) {
+            jvmtest.Check.equal(expected, result, what + " result");
+            jvmtest.Check.isTrue(reason != null && reason.contains(words),
+                    what + ": reason \"" + reason + "\" does not say \"" + words + "\"");
+            jvmtest.Check.equal(expectedCode, code, what + " error code");
+        }
+    }
+
+    static Outcome onFreshThread(java.util.function.Supplier<Object> call) {
+        Outcome outcome = new Outcome();
+        outcome.code = errorAfter(() -> {
+            outcome.result = call.get();
+            outcome.reason = com.vantrel.android.sdk.gxe.util.GxError.getLastReason();
+        });
+        return outcome;
     }
 
     /** Runs the action on a new thread and returns that thread's error code afterwards. */

@@ -116,6 +116,55 @@ public class FontTest {
         }
     }
 
+    @Test
+    public void fontsThatCannotBeUsedSayWhyWithoutAnErrorCode() throws Exception {
+        Path dir = Files.createTempDirectory("gxe-fonts");
+        Path notes = Files.write(dir.resolve("notes.ttf"), "not a font at all".getBytes("UTF-8"));
+        Path pipe = dir.resolve("pipe.ttf");
+        Check.equal(0, new ProcessBuilder("mkfifo", pipe.toString()).start().waitFor(), "mkfifo");
+        Path locked = Files.copy(Paths.get(Fixtures.SANS), dir.resolve("locked.ttf"));
+        Check.isTrue(locked.toFile().setReadable(false, false), "chmod");
+        int none = com.vantrel.android.sdk.gxe.util.GxError.NONE;
+        try (GxText text = withoutFont()) {
+            String missing = dir.resolve("missing.ttf").toString();
+            Fixtures.onFreshThread(() -> text.setFont(missing))
+                    .failed(false, missing + ": cannot be opened (No such file or directory)", none, "missing");
+            // A file is tried once per process.
+            Fixtures.onFreshThread(() -> text.setFont(missing))
+                    .failed(false, missing + ": could not be read when it was first asked for", none, "again");
+            Fixtures.onFreshThread(() -> text.setFont(dir.toString()))
+                    .failed(false, "not a regular file", none, "folder");
+            // A pipe is refused at once, not read (which would wait for a writer).
+            Fixtures.onFreshThread(() -> text.setFont(pipe.toString()))
+                    .failed(false, "not a regular file", none, "pipe");
+            Fixtures.onFreshThread(() -> text.setFont(notes.toString()))
+                    .failed(false, "notes.ttf: not a font", none, "not a font");
+            if (!Files.isReadable(locked)) { // root reads it all the same
+                Fixtures.onFreshThread(() -> text.setFont(locked.toString()))
+                        .failed(false, "Permission denied", none, "unreadable");
+            }
+            Fixtures.onFreshThread(() -> text.setFont("garbage", new byte[] {1, 2, 3, 4}))
+                    .failed(false, "garbage: not a font", none, "garbage bytes");
+            Fixtures.onFreshThread(() -> FontManager.insertFontData("no-bytes", new byte[0]))
+                    .failed(false, "no-bytes: no font bytes", none, "no bytes");
+            Fixtures.onFreshThread(() -> text.setFont(new AssetManager(dir.toString()), "missing.ttf"))
+                    .failed(false, "missing.ttf: no such asset", none, "missing asset");
+            Fixtures.onFreshThread(() -> text.setFont((String) null))
+                    .failed(false, "no font path", none, "null path");
+            // A call that works starts without a reason and leaves none.
+            Fixtures.Outcome works = Fixtures.onFreshThread(() -> {
+                text.setFont("/nonexistent/font.ttf");
+                return text.setFont(Fixtures.SANS);
+            });
+            Check.equal(true, works.result, "font");
+            Check.isNull(works.reason, "reason after success");
+        } finally {
+            for (Path p : new Path[] {notes, pipe, locked, dir}) {
+                Files.delete(p);
+            }
+        }
+    }
+
     /** A family that counts how often its fonts are asked for. */
     private static final class CountingFamily extends FontConfig.Family {
         int fontsAsked;
