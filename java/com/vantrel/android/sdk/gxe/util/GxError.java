@@ -1,7 +1,7 @@
 package com.vantrel.android.sdk.gxe.util;
 
 /**
- * Error codes of the native library.
+ * Error codes and failure reasons of the native library.
  *
  * <p>A library call that fails returns {@code false}, {@code 0}, {@code -1} or {@code null}. Two things are
  * kept per thread to tell why, each read on the thread that made the call: a code, {@link #getLastError()},
@@ -64,11 +64,11 @@ public final class GxError {
      * Why the last failed library call on the calling thread failed, in words (for people and logs, not
      * for parsing), or null when no failure left a reason.
      *
-     * <p>Setting a font ({@code GxText.setFont}, {@code FontManager.insertFontData}), handing over the
-     * system's fonts and adding an effect start with no reason, so after one of them failed the reason is
-     * its own. Other calls leave an earlier reason in place unless they fail with one of their own; like
-     * the error code, a reason is not cleared by a call that succeeds. Read it right after the call that
-     * failed.
+     * <p>Every failure of setting a font ({@code GxText.setFont}, {@code FontManager.insertFontData},
+     * {@code FontManager.setFontConfig}), of {@code SystemFonts.install} and of adding an effect leaves a
+     * reason of its own. Other calls may fail without one (a null paint, say) and then leave an earlier
+     * reason in place; like the error code, a reason is not cleared by a call that succeeds. Read it right
+     * after the call that failed.
      */
     public static String getLastReason() {
         NativeLibrary.load();
