@@ -9,6 +9,8 @@ packages=(
   # tests and benchmarks (GoogleTest is built from its source package so the
   # cross build gets an arm64 copy of it too)
   googletest libbenchmark-dev
+  # the comparison benchmark (bench/compare_bench.cpp) and the SIMD row kernels
+  libass-dev libhwy-dev
   # 64-bit Arm cross build, its tests run under emulation
   g++-aarch64-linux-gnu qemu-user
   # text stack (shaping, glyph coverage, the system's font list) and real fonts for its tests
@@ -16,7 +18,7 @@ packages=(
   # the Java bridge: JNI headers, javac and the JVM its tests run on
   openjdk-17-jdk-headless
   # the same libraries for the Arm build, installed beside the native ones
-  libharfbuzz-dev:arm64 libfreetype-dev:arm64 libfontconfig-dev:arm64
+  libharfbuzz-dev:arm64 libfreetype-dev:arm64 libfontconfig-dev:arm64 libhwy-dev:arm64
   # the command-line renderer: PNG files, line breaking, JSON effect files
   libpng-dev libicu-dev nlohmann-json3-dev libpng-dev:arm64 libicu-dev:arm64
 )
