@@ -9,6 +9,7 @@
 
 #include "effect/GxGlyph.h"
 #include "effect/GxProperty.h"
+#include "effect/GxScratch.h"
 #include "foundation/GxBitmap.h"
 #include "foundation/GxRect.h"
 
@@ -53,6 +54,9 @@ struct ParamPostProcessing {
     GxRect* textRect;    // glyph box, clamped to src, never empty
     int32_t separateWorkImage;
     GxBitmap* extraDst;  // second target while drawing to the work image, else null
+    // The stack's work memory; the layer's slots are free for it until it
+    // returns. Null: the layer allocates its own.
+    GxScratch* scratch = nullptr;
 };
 
 }  // namespace GxECore

@@ -23,6 +23,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <cstring>
 #include <new>
 
 #include "effect/GxBlendRows.h"
@@ -101,6 +102,46 @@ int32_t BevelStyle(GxECoreBase* layer) {
 }
 
 bool IsStrokeKind(int kind) { return kind == GxECore::kStroke || kind == GxECore::kReserved; }
+
+// A zeroed width x height image, on the spare's pixel block when it is large
+// enough (the spare is used up; *capacity becomes the block's size), else new.
+GxBitmap* ReuseOrMake(GxBitmap** spare, size_t* spareBytes, unsigned w, unsigned h, unsigned depth,
+                      size_t* capacity) {
+    size_t bytes = 0;
+    GxBitmap* image = *spare;
+    *capacity = 0;
+    if (image != nullptr && image->bytesPerPixel == depth && GxBitmap::PixelBytes(w, h, depth, &bytes) &&
+        bytes <= *spareBytes) {
+        *capacity = *spareBytes;
+        *spare = nullptr;
+        *spareBytes = 0;
+        image->width = w;
+        image->height = h;
+        std::memset(image->pixels, 0, bytes);
+        return image;
+    }
+    return new (std::nothrow) GxBitmap(w, h, depth);
+}
+
+// Keeps a finished image as the spare (the larger block wins). `capacity` is
+// its block's size when known, else 0.
+void KeepSpare(GxBitmap** spare, size_t* spareBytes, GxBitmap* image, size_t capacity) {
+    if (image == nullptr) return;
+    size_t bytes = 0;
+    if (image->pixels == nullptr ||
+        !GxBitmap::PixelBytes(image->width, image->height, image->bytesPerPixel, &bytes)) {
+        delete image;
+        return;
+    }
+    if (capacity > bytes) bytes = capacity;
+    if (*spare != nullptr && *spareBytes >= bytes) {
+        delete image;
+        return;
+    }
+    delete *spare;
+    *spare = image;
+    *spareBytes = bytes;
+}
 
 }  // namespace
 
@@ -214,11 +255,22 @@ void GxEffect::releaseBitmap() {
     srcBitmap = nullptr;
     delete workBitmap;
     workBitmap = nullptr;
+    srcCapacity = workCapacity = 0;
     dstBitmap = nullptr;
+    delete spareMask;
+    spareMask = nullptr;
+    spareMaskBytes = 0;
+    delete spareWork;
+    spareWork = nullptr;
+    spareWorkBytes = 0;
+    scratch.release();
 }
 
 void GxEffect::setSrcBitmap(GxBitmap* bitmap) {
-    if (bitmap != srcBitmap) delete srcBitmap;
+    if (bitmap != srcBitmap) {
+        delete srcBitmap;
+        srcCapacity = 0;
+    }
     srcBitmap = bitmap;
 }
 
@@ -441,11 +493,11 @@ void GxEffect::initEffect(int width, int height) {
     }
 
     const unsigned w = unsigned(std::max(width, 0)), h = unsigned(std::max(height, 0));
-    delete srcBitmap;
-    srcBitmap = new (std::nothrow) GxBitmap(w, h, 1);
+    KeepSpare(&spareMask, &spareMaskBytes, srcBitmap, srcCapacity);
+    srcBitmap = ReuseOrMake(&spareMask, &spareMaskBytes, w, h, 1, &srcCapacity);
     if (separateWorkImage == 1) {
-        delete workBitmap;
-        workBitmap = new (std::nothrow) GxBitmap(w, h, 4);
+        KeepSpare(&spareWork, &spareWorkBytes, workBitmap, workCapacity);
+        workBitmap = ReuseOrMake(&spareWork, &spareWorkBytes, w, h, 4, &workCapacity);
     }
     orderLayers();
 
@@ -521,7 +573,8 @@ void GxEffect::doEffectPostProcessing() {
     textRect.bottom = std::max(std::min(textRect.bottom, maskHeight), 0);
 
     if (textRect.right > textRect.left && textRect.bottom > textRect.top) {
-        GxECore::ParamPostProcessing pp{dstBitmap, srcBitmap, &textRect, separateWorkImage, nullptr};
+        GxECore::ParamPostProcessing pp{dstBitmap, srcBitmap, &textRect, separateWorkImage, nullptr,
+                                        &scratch};
         for (GxECoreBase* layer : renderOrder) {
             if (separateWorkImage == 1) chooseTargets(layer, &pp);
             layer->doPostProcessing(&pp);
@@ -547,9 +600,9 @@ void GxEffect::compositeLayers(GxBitmap* dst) {
         }
         if (n > 0) rows.unpremultiply(dst->pixels, int(n), uint32_t(textAlpha) & 0xFF);
     }
-    delete srcBitmap;
+    KeepSpare(&spareMask, &spareMaskBytes, srcBitmap, srcCapacity);
     srcBitmap = nullptr;
-    delete workBitmap;
+    KeepSpare(&spareWork, &spareWorkBytes, workBitmap, workCapacity);
     workBitmap = nullptr;
     dstBitmap = nullptr;
     separateWorkImage = 0;

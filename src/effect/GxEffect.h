@@ -6,8 +6,9 @@
 //
 // Drawing protocol: initEffect(w, h); setDstBitmap(dst); renderEffectLayer()
 // per glyph; doEffectPostProcessing(); compositeLayers(dst). A stack may be
-// drawn any number of times; its mask and work image live only from
-// initEffect to compositeLayers.
+// drawn any number of times; its mask and work image are handed out only from
+// initEffect to compositeLayers, and their memory is kept for the next
+// drawing (as is the layers' work memory) until releaseBitmap().
 
 #include <cstdint>
 #include <vector>
@@ -15,6 +16,7 @@
 #include "effect/GxECoreBase.h"
 #include "effect/GxGlyph.h"
 #include "effect/GxProperty.h"
+#include "effect/GxScratch.h"
 #include "foundation/GxBitmap.h"
 #include "foundation/GxRect.h"
 
@@ -49,6 +51,7 @@ public:
     void releaseEffect();
     void cleanAllEffect();
     void cleanLayers();
+    // Also frees the memory kept for the next drawing.
     void releaseBitmap();
 
     // Each builds a record from clamped arguments and adds it; returns the
@@ -133,6 +136,15 @@ private:
     GxBitmap* srcBitmap = nullptr;          // owned, 8-bit mask
     GxBitmap* dstBitmap = nullptr;          // the caller's
     GxBitmap* workBitmap = nullptr;         // owned, only in the separate-work-image mode
+    // Finished mask and work image, kept so the next drawing can reuse
+    // their pixel blocks (capacity in bytes beside each).
+    size_t srcCapacity = 0;                 // pixel block sizes of the two above, 0: their own size
+    size_t workCapacity = 0;
+    GxBitmap* spareMask = nullptr;
+    size_t spareMaskBytes = 0;
+    GxBitmap* spareWork = nullptr;
+    size_t spareWorkBytes = 0;
+    GxScratch scratch;                      // the layers' work memory
     GxRect textRect;
     bool textRectReset = true;
     int32_t separateWorkImage = 0;
