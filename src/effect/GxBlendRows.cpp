@@ -239,6 +239,11 @@ void Unpremultiply(uint8_t* p, int n, uint32_t alpha) {
     }
 }
 
+void UnpremultiplySwap(uint8_t* p, int n, uint32_t alpha) {
+    Unpremultiply(p, n, alpha);
+    SwapRedBlue(p, n);
+}
+
 }  // namespace Scalar
 
 const Table& ScalarTable() {
@@ -247,6 +252,7 @@ const Table& ScalarTable() {
         Scalar::DstOverSA8To32, Scalar::Copy8To32,         Scalar::Max8To8,
         Scalar::SrcOver32To32, Scalar::DstOver32To32,      Scalar::DstOver32To32Bytes,
         Scalar::SwapRedBlue,   Scalar::MergeWork,          Scalar::Unpremultiply,
+        Scalar::UnpremultiplySwap,
     };
     return table;
 }

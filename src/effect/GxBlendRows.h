@@ -32,6 +32,8 @@ struct Table {
     RowsSwap swapRedBlue;
     RowsMerge mergeWork;
     RowsUnpremultiply unpremultiply;
+    // Unpremultiply, then swapRedBlue, in one pass.
+    RowsUnpremultiply unpremultiplySwap;
 };
 
 // The reference kernels: plain C++, one pixel at a time.
@@ -48,6 +50,7 @@ void DstOver32To32Bytes(uint8_t* dst, const uint8_t* src, int n, int flag);
 void SwapRedBlue(uint8_t* pixels, int n);
 void MergeWork(uint8_t* dst, const uint8_t* work, const uint8_t* coverage, int n);
 void Unpremultiply(uint8_t* pixels, int n, uint32_t alpha);
+void UnpremultiplySwap(uint8_t* pixels, int n, uint32_t alpha);
 }  // namespace Scalar
 
 const Table& ScalarTable();

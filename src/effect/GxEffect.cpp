@@ -598,7 +598,10 @@ void GxEffect::compositeLayers(GxBitmap* dst) {
             const size_t count = std::min({n, maskPixels, workPixels});
             if (count > 0) rows.mergeWork(dst->pixels, workBitmap->pixels, srcBitmap->pixels, int(count));
         }
-        if (n > 0) rows.unpremultiply(dst->pixels, int(n), uint32_t(textAlpha) & 0xFF);
+        if (n > 0) {
+            const auto finish = wordOrderOutput ? rows.unpremultiplySwap : rows.unpremultiply;
+            finish(dst->pixels, int(n), uint32_t(textAlpha) & 0xFF);
+        }
     }
     KeepSpare(&spareMask, &spareMaskBytes, srcBitmap, srcCapacity);
     srcBitmap = nullptr;

@@ -112,6 +112,11 @@ public:
     char* getMapKey();
     char* getMapKey(unsigned color);
 
+    // When set, compositeLayers leaves little-endian words 0xAARRGGBB (red and
+    // blue swapped as GxBlender::convertBGRAToARGB does) instead of bytes
+    // R, G, B, A, in the same pass. Off by default.
+    void setWordOrderOutput(bool words) { wordOrderOutput = words; }
+
     void initEffect(int width, int height);
     void renderEffectLayer(int x, int y, GxGlyph* glyph);
     void doEffectPostProcessing();
@@ -153,6 +158,7 @@ private:
     int32_t nextEffectId = 0;
     int32_t textAlpha = -1;  // low byte used
     bool layerStyle = false;
+    bool wordOrderOutput = false;
 };
 
 }  // namespace Glimmer

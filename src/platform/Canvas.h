@@ -17,6 +17,8 @@ public:
     void Clear();
     // Narrows the clip to its intersection with [left, right) x [top, bottom).
     void ClipRect(int left, int top, int right, int bottom);
+    // Every pixel outside the clip to transparent black.
+    void ClearOutsideClip();
     // Fills the pixels whose centres lie inside the rectangle (no
     // anti-aliasing) with 0xAARRGGBB `color`, stored as bytes R, G, B, A.
     void FillRect(float left, float top, float right, float bottom, uint32_t color);

@@ -20,15 +20,17 @@
 // the text there stay visible). With a background colour, every line's box
 // is filled. Both bitmaps are then turned into 0xAARRGGBB words, and the
 // effect picture is drawn over the background with source-over inside the
-// clip. The line boxes are moved by every render (the glyph drawing shifts
-// them by the effects' top margin each time): that is how it has always
-// behaved and is kept.
+// clip. Without a background that is the effect picture itself inside the
+// clip, which is how it is made then (see RenderTextEffect). The line boxes
+// are moved by every render (the glyph drawing shifts them by the effects'
+// top margin each time): that is how it has always behaved and is kept.
 
 #include "text/GxTextObject.h"
 
 #include <algorithm>
 #include <climits>
 #include <cstdio>
+#include <cstring>
 #include <mutex>
 #include <new>
 #include <type_traits>
@@ -107,6 +109,20 @@ void RegisterScript(uint32_t script) {
 
 int ClampToInt(int64_t value) { return int(std::clamp<int64_t>(value, INT_MIN, INT_MAX)); }
 
+// A width x height 32-bit image on the pixel block of `*kept` when that is the
+// same size (taken out of *kept), else a new one. Zeroed when `zeroed`; a new
+// one always is.
+GxBitmap* ImageOfSize(GxBitmap** kept, unsigned width, unsigned height, bool zeroed) {
+    GxBitmap* image = *kept;
+    if (image != nullptr && image->pixels != nullptr && image->width == width && image->height == height &&
+        image->bytesPerPixel == 4) {
+        *kept = nullptr;
+        if (zeroed) std::memset(image->pixels, 0, size_t(width) * height * 4);
+        return image;
+    }
+    return new (std::nothrow) GxBitmap(width, height, 4);
+}
+
 bool IsWeakScript(uint32_t script) {
     return script == Platform::kScriptInherited || script == Platform::kScriptCommon;
 }
@@ -125,6 +141,8 @@ struct GxTextObjectImpl {
     int32_t runtimeHandle = -1;
     uint32_t textStyle = 0;
     GxBitmap* result = nullptr;
+    // The image the next render draws into (see RenderTextEffect).
+    GxBitmap* spareImage = nullptr;
     GxView* view = nullptr;
     Platform::Paint paint;
     uint32_t backgroundColor = 0;
@@ -166,6 +184,7 @@ GxTextObjectImpl::~GxTextObjectImpl() {
     delete fontDrawing;
     delete effect;
     delete result;
+    delete spareImage;
     delete view;
 }
 
@@ -468,28 +487,32 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
         GX_REPORT_ERROR(kTag, kErrorInvalidArgument);
         return nullptr;
     }
-    GxBitmap* effectBitmap = new (std::nothrow) GxBitmap(unsigned(width), unsigned(height), 4);
-    if (effectBitmap == nullptr) return nullptr;
     if (M->fontDrawing == nullptr) {
         GX_REPORT_ERROR(kTag, kErrorNotConstructed);
-        delete effectBitmap;
         return M->result != nullptr ? reinterpret_cast<unsigned*>(M->result->pixels) : nullptr;
     }
 
+    // Two images take turns, so a render allocates nothing once the size is
+    // known and never hands out the previous result's pixels again (they were
+    // promised until this render only). Without background boxes the cleared
+    // result would take the effect picture as it is inside the clip
+    // (source-over onto transparent black copies a pixel exactly, and the
+    // stack leaves its transparent pixels all 0), so the
+    // effect picture becomes the result in place: the stack leaves it in word
+    // order and the pixels outside the clip are cleared. With boxes a second
+    // image takes the background and the effect picture is drawn over it.
+    const bool boxes = M->hasBackground && M->lineInfo != nullptr && M->lineInfo->GetCount() > 0;
+    GxBitmap* effectBitmap =
+        ImageOfSize(boxes ? &M->result : &M->spareImage, unsigned(width), unsigned(height), true);
+    if (effectBitmap == nullptr) return nullptr;
+
+    if (M->effect != nullptr) M->effect->setWordOrderOutput(!boxes);
     M->fontDrawing->DrawTextEffect(this, effectBitmap);
+    if (M->effect != nullptr) M->effect->setWordOrderOutput(false);
 
-    GxBitmap* result = new (std::nothrow) GxBitmap(unsigned(width), unsigned(height), 4);
-    if (result == nullptr) {
-        delete effectBitmap;
-        return nullptr;
-    }
-    // A bitmap whose pixels could not be had draws nothing.
-    bool drawable = result->pixels != nullptr && effectBitmap->pixels != nullptr;
-    Platform::Canvas canvas(drawable ? result->pixels : nullptr, width, height);
-    canvas.Clear();
-
-    const GxView* view = M->view;
-    if (view != nullptr) {
+    auto clipToText = [&](Platform::Canvas& canvas) {
+        const GxView* view = M->view;
+        if (view == nullptr) return;
         int horizontal = view->gravity & GxView::kGravityHorizontalMask;
         int vertical = view->gravity & GxView::kGravityVerticalMask;
         int64_t bitmapWidth = view->GetBitmapWidth();
@@ -501,9 +524,26 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
         int bottom = ClampToInt(vertical == GxView::kGravityBottom ? bitmapHeight
                                                                     : bitmapHeight - view->GetPaddingBottom());
         canvas.ClipRect(left, top, right, bottom);
-    }
+    };
 
-    if (M->hasBackground && M->lineInfo != nullptr) {
+    GxBitmap* result = effectBitmap;
+    if (!boxes) {
+        Platform::Canvas canvas(effectBitmap->pixels, width, height);
+        clipToText(canvas);
+        canvas.ClearOutsideClip();
+        delete M->spareImage;
+        M->spareImage = M->result;
+    } else {
+        result = ImageOfSize(&M->spareImage, unsigned(width), unsigned(height), false);
+        if (result == nullptr) {
+            delete effectBitmap;
+            return nullptr;
+        }
+        // A bitmap whose pixels could not be had draws nothing.
+        bool drawable = result->pixels != nullptr && effectBitmap->pixels != nullptr;
+        Platform::Canvas canvas(drawable ? result->pixels : nullptr, width, height);
+        canvas.Clear();
+        clipToText(canvas);
         int count = M->lineInfo->GetCount();
         for (int i = 0; i < count; ++i) {
             const auto* line = static_cast<const GxLineInfo*>(M->lineInfo->Get(i));
@@ -511,14 +551,13 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
             canvas.FillRect(float(line->bounds.left), float(line->bounds.top), float(line->bounds.right),
                             float(line->bounds.bottom), M->backgroundColor);
         }
+        GxBlender::convertBGRAToARGB(result);
+        GxBlender::convertBGRAToARGB(effectBitmap);
+        if (drawable) canvas.DrawImage(effectBitmap->pixels, width, height, 0, 0);
+        delete M->spareImage;
+        M->spareImage = effectBitmap;
+        delete M->result;  // null when it became the effect image
     }
-
-    GxBlender::convertBGRAToARGB(result);
-    GxBlender::convertBGRAToARGB(effectBitmap);
-    if (drawable) canvas.DrawImage(effectBitmap->pixels, width, height, 0, 0);
-
-    delete effectBitmap;
-    delete M->result;
     M->result = result;
     Platform::LogPrint(Platform::kLogDebug, kTag, "RenderTextEffect(%p / %d) <<< End.",
                        static_cast<void*>(this), M->runtimeHandle);

@@ -84,5 +84,36 @@ TEST(CanvasTest, DrawImageAtAnOffsetDrawsOnlyItsVisiblePart) {
     EXPECT_EQ(dst.At(0, 0), (Pixel{0, 0, 0, 0}));
 }
 
+// The text object relies on this when there is no background: drawing a
+// straight-colour picture whose transparent pixels are 0 (as the effect stack
+// leaves it) onto a cleared canvas gives the picture itself inside the clip.
+TEST(CanvasTest, DrawingOntoClearedPixelsEqualsClearingOutsideTheClip) {
+    const int w = 64, h = 5;
+    Image picture(w, h, {0, 0, 0, 0});
+    uint32_t seed = 12345;
+    for (size_t i = 0; i < picture.bytes.size(); ++i) {
+        seed = seed * 1664525u + 1013904223u;
+        picture.bytes[i] = uint8_t(seed >> 24);
+    }
+    for (int i = 0; i < w * h; ++i) {
+        uint8_t* p = &picture.bytes[size_t(i) * 4];
+        if (i < 256) p[3] = uint8_t(i);  // every alpha
+        if (p[3] == 0) p[0] = p[1] = p[2] = 0;
+    }
+
+    Image drawn(w, h, {7, 7, 7, 7});
+    Canvas onto(drawn.bytes.data(), w, h);
+    onto.Clear();
+    onto.ClipRect(3, 1, 60, 4);
+    onto.DrawImage(picture.bytes.data(), w, h, 0, 0);
+
+    Image kept = picture;
+    Canvas in(kept.bytes.data(), w, h);
+    in.ClipRect(3, 1, 60, 4);
+    in.ClearOutsideClip();
+    EXPECT_EQ(drawn.bytes, kept.bytes);
+    EXPECT_EQ(kept.At(2, 2), (Pixel{0, 0, 0, 0}));
+}
+
 }  // namespace
 }  // namespace Glimmer::Platform

@@ -66,6 +66,20 @@ void Canvas::ClipRect(int left, int top, int right, int bottom) {
     clipBottom_ = std::min(clipBottom_, bottom);
 }
 
+void Canvas::ClearOutsideClip() {
+    if (width_ <= 0) return;
+    const size_t rowBytes = size_t(width_) * 4;
+    const int x0 = std::clamp(clipLeft_, 0, width_), x1 = std::clamp(clipRight_, x0, width_);
+    const int y0 = std::clamp(clipTop_, 0, height_), y1 = std::clamp(clipBottom_, y0, height_);
+    std::memset(pixels_, 0, size_t(y0) * rowBytes);
+    for (int y = y0; y < y1; ++y) {
+        uint8_t* row = pixels_ + size_t(y) * rowBytes;
+        std::memset(row, 0, size_t(x0) * 4);
+        std::memset(row + size_t(x1) * 4, 0, size_t(width_ - x1) * 4);
+    }
+    std::memset(pixels_ + size_t(y1) * rowBytes, 0, size_t(height_ - y1) * rowBytes);
+}
+
 void Canvas::FillRect(float left, float top, float right, float bottom, uint32_t color) {
     int x0 = std::max(clipLeft_, CentreIndex(left));
     int x1 = std::min(clipRight_, CentreIndex(right));
