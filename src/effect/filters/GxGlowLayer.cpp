@@ -5,6 +5,7 @@
 #include "effect/GxBlender.h"
 #include "effect/GxEffectMath.h"
 #include "effect/filters/GxColorRamp.h"
+#include "effect/filters/GxBlurRows.h"
 #include "effect/filters/GxGaussian.h"
 #include "effect/filters/GxLayerSupport.h"
 
@@ -64,42 +65,27 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
 // Rows [Rg, H - Rg) of the image, each blurred vertically into a byte row and
 // then horizontally into colour. `frame` fills the columns the horizontal
 // pass cannot reach. `shade[v]` is the premultiplied colour of result v.
-void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& plan,
-                   const int* weights, int sum, bool inverted, const uint32_t* shade,
-                   uint32_t frame, int32_t* acc, unsigned char* row) {
+// `row` and `values` are W bytes of scratch.
+void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& plan, const GxGaussian& g,
+                   bool inverted, const uint32_t* shade, uint32_t frame, unsigned char* row,
+                   unsigned char* values) {
     const int32_t W = plan.width, R = plan.radius;
     const size_t stride = size_t(W);
+    const int n = W - 2 * R;
+    const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
     // Columns outside [R, W - R) of the byte row are never computed and read
     // as 0 (no coverage): they lie in the frame, 2g from the glyphs. For the
     // inner glow this matters at one place: the box filter's 0 in the plane's
     // first and last column is not blurred back in as "inside".
     std::memset(row, 0, stride);
-    const int32_t full = 255 * sum;
     for (int32_t y = R; y < plan.height - R; ++y) {
-        const unsigned char* centre = plane + size_t(y) * stride;
-        for (int32_t x = R; x < W - R; ++x) acc[x] = int32_t(centre[x]) * weights[0];
-        for (int32_t i = 1; i <= R; ++i) {
-            const unsigned char* above = centre - size_t(i) * stride;
-            const unsigned char* below = centre + size_t(i) * stride;
-            const int32_t wi = weights[i];
-            for (int32_t x = R; x < W - R; ++x) acc[x] += (int32_t(above[x]) + int32_t(below[x])) * wi;
-        }
-        for (int32_t x = R; x < W - R; ++x)
-            row[x] = uint8_t(inverted ? (full - acc[x]) / sum : acc[x] / sum);
-
+        blur(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R);
+        blur(row + R, 1, n, g, inverted, values + R);
         uint32_t* out = image + size_t(y) * stride;
-        // Horizontal pass, tap by tap over the whole row like the vertical
-        // one (the same integer sums, in an order that vectorises).
-        for (int32_t x = R; x < W - R; ++x) acc[x] = int32_t(row[x]) * weights[0];
-        for (int32_t i = 1; i <= R; ++i) {
-            const int32_t wi = weights[i];
-            for (int32_t x = R; x < W - R; ++x) acc[x] += (int32_t(row[x - i]) + int32_t(row[x + i])) * wi;
-        }
         for (int32_t x = 0; x < R; ++x) out[x] = frame;
-        for (int32_t x = R; x < W - R; ++x) {
-            int32_t v = inverted ? (full - acc[x]) / sum : acc[x] / sum;
-            out[x] = shade[v < 256 ? v : 256];
-        }
+        // Results never exceed 255, so entry 256 (past the edge colour) is
+        // only reached by the rule min(v, 256) on paper.
+        for (int32_t x = R; x < W - R; ++x) out[x] = shade[values[x]];
         for (int32_t x = W - R; x < W; ++x) out[x] = frame;
     }
     const int32_t firstUnprocessed = plan.height - R > R ? plan.height - R : R;
@@ -112,17 +98,30 @@ void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& 
 }  // namespace
 
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height) {
+    return GlowBoxFilter(plane, iterations, width, height, nullptr);
+}
+
+bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch) {
     if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
     const size_t w = size_t(width);
-    WorkBuffer<unsigned char> saved = AllocateWork<unsigned char>(w);
-    WorkBuffer<unsigned char> out = AllocateWork<unsigned char>(w);
-    WorkBuffer<uint16_t> columns = AllocateWork<uint16_t>(w);
-    if (!saved || !out || !columns) return false;
+    // Three rows: the saved row above, the output row, the column sums.
+    WorkBuffer<unsigned char> own;
+    unsigned char* rows = nullptr;
+    if (scratch != nullptr) {
+        rows = scratch->get<unsigned char>(GxScratch::kRows, 4 * w);
+    } else {
+        own = AllocateWork<unsigned char>(4 * w);
+        rows = own.get();
+    }
+    if (rows == nullptr) return false;
+    unsigned char* saved = rows;
+    unsigned char* out = rows + w;
+    auto* columns = reinterpret_cast<uint16_t*>(rows + 2 * w);  // the block is 64-byte aligned, 2w even
     out[0] = 0;
     out[w - 1] = 0;
     for (int pass = 0; pass < iterations; ++pass) {
         // `saved` holds the row above as it was before this pass rewrote it.
-        std::memcpy(saved.get(), plane, w);
+        std::memcpy(saved, plane, w);
         for (int y = 1; y < height - 1; ++y) {
             unsigned char* row = plane + size_t(y) * w;
             const unsigned char* below = row + w;
@@ -133,8 +132,8 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height) 
                 s >>= 2;
                 out[x] = uint8_t(s > 255 ? 255 : s);
             }
-            std::memcpy(saved.get(), row, w);
-            std::memcpy(row, out.get(), w);
+            std::memcpy(saved, row, w);
+            std::memcpy(row, out, w);
         }
     }
     return true;
@@ -207,12 +206,24 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     if (!PlanGlow(property->size, box, &plan)) return;
     const bool inverted = side == Side::kInner;
 
-    WorkBuffer<uint32_t> image = AllocateWork<uint32_t>(plan.pixels);
-    WorkBuffer<unsigned char> plane = AllocateWork<unsigned char>(plan.pixels);
-    WorkBuffer<int> weights = AllocateWork<int>(size_t(plan.radius) + 1);
-    WorkBuffer<int32_t> acc = AllocateWork<int32_t>(size_t(plan.width));
-    WorkBuffer<unsigned char> row = AllocateWork<unsigned char>(size_t(plan.width));
-    if (!image || !plane || !weights || !acc || !row) return;
+    GxGaussian gaussian;
+    if (!PlanGaussian(&gaussian, plan.radius, kGlowGaussianCentre, GaussianRounding::kDouble)) return;
+    // Work memory: the stack's when it lends it, else our own for this call.
+    GxScratch* scratch = p->scratch;
+    WorkBuffer<uint32_t> ownImage;
+    WorkBuffer<unsigned char> ownPlane, ownRows;
+    uint32_t* image = nullptr;
+    unsigned char* plane = nullptr;
+    if (scratch != nullptr) {
+        image = scratch->get<uint32_t>(GxScratch::kPlaneA, plan.pixels);
+        plane = scratch->get<unsigned char>(GxScratch::kPlaneB, plan.pixels);
+    } else {
+        ownImage = AllocateWork<uint32_t>(plan.pixels);
+        ownPlane = AllocateWork<unsigned char>(plan.pixels);
+        image = ownImage.get();
+        plane = ownPlane.get();
+    }
+    if (image == nullptr || plane == nullptr) return;
 
     uint32_t table[kColorTableSize];
     makeColorLUT(table, 0.3f, kRampLinear);
@@ -220,15 +231,22 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     uint32_t shade[kColorTableSize];
     for (int v = 0; v < kColorTableSize; ++v) shade[v] = PremultiplyColor(table[256 - v]);
 
-    FillPlane(plane.get(), plan, *p->src, box, inverted);
-    if (!GlowBoxFilter(plane.get(), plan.iterations, plan.width, plan.height)) return;
+    FillPlane(plane, plan, *p->src, box, inverted);
+    if (!GlowBoxFilter(plane, plan.iterations, plan.width, plan.height, scratch)) return;
 
-    int sum = 0;
-    computeGaussianWeights(weights.get(), &sum, plan.radius);
-    BlurAndColour(plane.get(), image.get(), plan, weights.get(), sum, inverted, shade,
-                  inverted ? 0xFFFFFFFFu : 0u, acc.get(), row.get());
+    // The box filter is done with the row buffers.
+    unsigned char* rows = nullptr;
+    if (scratch != nullptr) {
+        rows = scratch->get<unsigned char>(GxScratch::kRows, 2 * size_t(plan.width));
+    } else {
+        ownRows = AllocateWork<unsigned char>(2 * size_t(plan.width));
+        rows = ownRows.get();
+    }
+    if (rows == nullptr) return;
+    BlurAndColour(plane, image, plan, gaussian, inverted, shade, inverted ? 0xFFFFFFFFu : 0u, rows,
+                  rows + plan.width);
 
-    GxBlender::drawBitmapBlend32(box.left - 2 * plan.g, box.top - 2 * plan.g, p->dst, image.get(),
+    GxBlender::drawBitmapBlend32(box.left - 2 * plan.g, box.top - 2 * plan.g, p->dst, image,
                                  plan.width, plan.height, plan.width, GxE_BLEND_DST_OVER);
 }
 

@@ -21,8 +21,8 @@
 //    pass also writes 0 into the first and last column of the rows it
 //    rewrites, which only the inverted plane of the inner glow notices.
 // 4. Blur and colour, per row y in [Rg, H - Rg): a vertical pass into a byte
-//    row, then a horizontal pass, each sample one integer division by the
-//    weight total S. The inner glow takes both passes as 255 minus the
+//    row, then a horizontal pass (the shared row kernel of GxBlurRows), each
+//    sample a weighted sum divided by the weight total S. The inner glow takes both passes as 255 minus the
 //    blurred value: the vertical one gives the blurred inside coverage, the
 //    horizontal one the blurred outside coverage. The result v picks
 //    table[256 - v] of the 257-entry colour table, so full coverage takes the
@@ -47,6 +47,7 @@
 
 #include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
+#include "effect/GxScratch.h"
 
 namespace Glimmer {
 
@@ -80,8 +81,9 @@ protected:
 };
 
 // The spread pass on its own; false (and the plane possibly half done) when
-// its row buffers cannot be allocated.
+// its row buffers cannot be allocated. With `scratch` its rows come from there.
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height);
+bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch);
 
 // The glow colour table for a record: single colour, first stop, or ramp from
 // 0; then the fade. Null `property` or a size of exactly 0: all transparent.

@@ -26,12 +26,12 @@
 //    when dy < -R, and in the other rows the first dx - R columns when dx > R
 //    or the columns from W + R + dx on when dx < -R.
 // 4. Columns: result pixel (x, y) reads work column x + R - dx (the padding
-//    shifts glyph column x to x + R), centred on work row y - dy. Each work
-//    column is gathered into a buffer of H + 4R + 2 bytes, 2R bytes of 255
-//    before the column and 255 after it, so taps above or below the plane
-//    read full inverse; the value is (centre * 100 + sum of (above + below) *
-//    w[i]) / S, at most 255 (clamped all the same). Every tap of the rows
-//    left to this step lands inside the buffer.
+//    shifts glyph column x to x + R), centred on work row y - dy. The work
+//    plane has 2R rows of 255 above it and 2R + 2 below, so taps above or
+//    below the glyph rows read full inverse; the value is (centre * 100 + sum
+//    of (above + below) * w[i]) / S, at most 255 (clamped all the same). Every
+//    tap of the rows left to this step lands on the plane. Both passes are the
+//    shared row kernel of GxBlurRows.
 // 5. Glyph pixels keep their value, all other pixels become 0 (the shade
 //    lies inside the glyphs, even in the uncovered parts of step 3). The
 //    value is not scaled by the glyph's coverage: the compositing scales
@@ -53,6 +53,7 @@
 
 #include "effect/GxBlender.h"
 #include "effect/filters/GxFilterLimits.h"
+#include "effect/filters/GxBlurRows.h"
 #include "effect/filters/GxGaussian.h"
 #include "effect/filters/GxLayerSupport.h"
 #include "effect/filters/GxShadowGeometry.h"
@@ -113,48 +114,51 @@ void GxInnerShadow::doPostProcessing(GxECore::ParamPostProcessing* p) {
         return;
     }
 
+    GxGaussian gaussian;
+    if (!PlanGaussian(&gaussian, R, kShadowGaussianCentre, GaussianRounding::kSingle)) return;
     const int64_t paddedW64 = int64_t(W) + 2 * int64_t(R);
-    size_t resultBytes = 0, paddedBytes = 0;
-    if (paddedW64 > INT32_MAX || !GxBitmap::PixelBytes(unsigned(W), unsigned(H), 1, &resultBytes) ||
-        !GxBitmap::PixelBytes(unsigned(paddedW64), unsigned(H), 1, &paddedBytes))
+    // The work plane with 2R rows of full inverse above it and 2R + 2 below.
+    const int64_t workH64 = int64_t(H) + 4 * int64_t(R) + 2;
+    size_t resultBytes = 0, workBytes = 0;
+    if (paddedW64 > INT32_MAX || workH64 > INT32_MAX ||
+        !GxBitmap::PixelBytes(unsigned(W), unsigned(H), 1, &resultBytes) ||
+        !GxBitmap::PixelBytes(unsigned(paddedW64), unsigned(workH64), 1, &workBytes))
         return;
     const int Wp = int(paddedW64);
-    const size_t columnBytes = size_t(H) + 4 * size_t(R) + 2;
-    const size_t accCount = size_t(Wp > H ? Wp : H);
+    const size_t rowBytes = size_t(W) + 4 * size_t(R);
 
-    WorkBuffer<unsigned char> result = AllocateWork<unsigned char>(resultBytes);
-    WorkBuffer<unsigned char> padded = AllocateWork<unsigned char>(paddedBytes, true);
-    WorkBuffer<int> weights = AllocateWork<int>(size_t(R) + 1);
-    WorkBuffer<unsigned char> work = AllocateWork<unsigned char>(paddedBytes, true);
-    WorkBuffer<unsigned char> column = AllocateWork<unsigned char>(columnBytes);
-    WorkBuffer<int32_t> acc = AllocateWork<int32_t>(accCount);
-    if (!result || !padded || !weights || !work || !column || !acc) return;
-    int S = 0;
-    computeGaussianWeights(weights.get(), &S, R);
-    const int* w = weights.get();
+    // Work memory: the stack's when it lends it, else our own for this call.
+    WorkBuffer<unsigned char> ownResult, ownWork, ownRow;
+    unsigned char* res = nullptr;
+    unsigned char* work = nullptr;
+    unsigned char* row = nullptr;
+    if (p->scratch != nullptr) {
+        res = p->scratch->get<unsigned char>(GxScratch::kPlaneA, resultBytes);
+        work = p->scratch->get<unsigned char>(GxScratch::kPlaneB, workBytes);
+        row = p->scratch->get<unsigned char>(GxScratch::kRows, rowBytes, true);
+    } else {
+        ownResult = AllocateWork<unsigned char>(resultBytes);
+        ownWork = AllocateWork<unsigned char>(workBytes);
+        ownRow = AllocateWork<unsigned char>(rowBytes, true);
+        res = ownResult.get();
+        work = ownWork.get();
+        row = ownRow.get();
+    }
+    if (res == nullptr || work == nullptr || row == nullptr) return;
+    const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
 
-    for (int y = 0; y < H; ++y)
-        std::memcpy(padded.get() + size_t(y) * Wp + R, mask + size_t(y) * srcStride, size_t(W));
-
-    // 2. Along the rows, as inverse. Only the W glyph columns of the padded
-    //    row can be non-zero, so only taps landing there subtract anything.
-    int32_t* a = acc.get();
+    // 2. Along the rows, as inverse. The glyph row sits 2R into a row of
+    //    zeros, so the taps of every padded column (R zeros either side of the
+    //    glyphs) land on the row; work row y is plane row 2R + y.
+    std::memset(work, 255, size_t(2 * R) * Wp);
+    std::memset(work + size_t(2 * R + H) * Wp, 255, size_t(2 * R + 2) * Wp);
     for (int y = 0; y < H; ++y) {
-        const unsigned char* g = padded.get() + size_t(y) * Wp;
-        for (int c = 0; c < Wp; ++c) a[c] = 255 * S;
-        for (int i = -R; i <= R; ++i) {
-            const int32_t wi = w[i < 0 ? -i : i];
-            const int c0 = R - i, c1 = R + W - i;  // c + i in [R, R + W)
-            const int from = c0 > 0 ? c0 : 0, to = c1 < Wp ? c1 : Wp;
-            for (int c = from; c < to; ++c) a[c] -= wi * int32_t(g[c + i]);
-        }
-        unsigned char* out = work.get() + size_t(y) * Wp;
-        for (int c = 0; c < Wp; ++c) out[c] = static_cast<unsigned char>(S != 0 ? a[c] / S : 0);
+        std::memcpy(row + 2 * size_t(R), mask + size_t(y) * srcStride, size_t(W));
+        blur(row + R, 1, Wp, gaussian, true, work + size_t(2 * R + y) * Wp);
     }
 
     // 3. Rows [yLo, yHi) x columns [xLo, xHi) read the work plane; the rest
     //    of the result is full shadow.
-    unsigned char* res = result.get();
     const int yLo = int(dy > R ? Clamp64(dy - R, 0, H) : 0);
     const int yHi = int(dy < -R ? Clamp64(H + R + dy, yLo, H) : H);
     const int xLo = int(dx > R ? Clamp64(dx - R, 0, W) : 0);
@@ -166,29 +170,11 @@ void GxInnerShadow::doPostProcessing(GxECore::ParamPostProcessing* p) {
         std::memset(res + size_t(y) * W + xHi, 255, size_t(W - xHi));
     }
 
-    // 4. Down the moved columns. Result row y is centred on buffer index
-    //    y + shift; for y in [yLo, yHi) its taps stay in [0, H + 4R).
-    unsigned char* col = column.get();
-    const int64_t shift = 2 * int64_t(R) - dy;
-    const int rows = yHi - yLo;
-    std::memset(col, 255, 2 * size_t(R));
-    std::memset(col + 2 * size_t(R) + H, 255, columnBytes - 2 * size_t(R) - size_t(H));
-    for (int x = xLo; rows > 0 && x < xHi; ++x) {
-        const int c = int(x + R - dx);
-        for (int r = 0; r < H; ++r) col[2 * size_t(R) + r] = work.get()[size_t(r) * Wp + c];
-        const unsigned char* centre = col + (shift + yLo);  // index >= R: see above
-        for (int k = 0; k < rows; ++k) a[k] = int32_t(centre[k]) * kShadowGaussianCentre;
-        for (int i = 1; i <= R; ++i) {
-            const int32_t wi = w[i];
-            const unsigned char* above = centre - i;
-            const unsigned char* below = centre + i;
-            for (int k = 0; k < rows; ++k) a[k] += (int32_t(above[k]) + int32_t(below[k])) * wi;
-        }
-        unsigned char* out = res + size_t(yLo) * W + x;
-        for (int k = 0; k < rows; ++k) {
-            const int32_t v = S != 0 ? a[k] / S : 0;
-            out[size_t(k) * W] = static_cast<unsigned char>(v < 255 ? v : 255);
-        }
+    // 4. Down the moved columns: result (x, y) is centred on work row y - dy,
+    //    column x + R - dx; for y in [yLo, yHi) the taps stay on the plane.
+    for (int y = yLo; y < yHi && xLo < xHi; ++y) {
+        const unsigned char* centre = work + size_t(2 * R + y - dy) * Wp + size_t(xLo + R - dx);
+        blur(centre, Wp, xHi - xLo, gaussian, false, res + size_t(y) * W + xLo);
     }
 
     // 5. The shade lies inside the glyphs.

@@ -9,7 +9,8 @@
 // zero pixels on every side. A separable integer Gaussian of radius R
 // (weights w[0] = 100 ... w[R] ~ 1, total S) then runs over it, first down
 // the columns into a row buffer, then along that row into the output plane:
-// each sample is one weighted sum divided by S (integer division). Only
+// each sample is one weighted sum divided by S (the shared row kernel of
+// GxBlurRows, exact integer quotients). Only
 // samples at least R pixels from the plane's border are computed, so every
 // tap stays inside the plane; the outer R pixels on each side stay 0 and the
 // inner R of the frame are where the blur spreads beyond the glyphs. The
@@ -31,6 +32,7 @@
 
 #include "effect/GxBlender.h"
 #include "effect/filters/GxFilterLimits.h"
+#include "effect/filters/GxBlurRows.h"
 #include "effect/filters/GxGaussian.h"
 #include "effect/filters/GxLayerSupport.h"
 #include "effect/filters/GxShadowGeometry.h"
@@ -41,40 +43,24 @@ namespace {
 
 // The separable blur. `in` and `out` are W x H planes; rows [R, H - R) and
 // columns [R, W - R) of `out` get the blurred value, everything else 0.
-// `row` (W bytes) and `acc` (W ints) are scratch.
-void BlurPlane(const unsigned char* in, unsigned char* out, int W, int H, int R, const int* w, int S,
-               unsigned char* row, int32_t* acc) {
-    if (R < 0 || W < 2 * R || H < 2 * R) return;  // the callers' planes are at least 4R on a side
+// `row` (W bytes) is scratch.
+void BlurPlane(const unsigned char* in, unsigned char* out, int W, int H, const GxGaussian& g,
+               unsigned char* row) {
+    const int R = g.radius;
+    if (W < 2 * R || H < 2 * R) return;  // the callers' planes are at least 4R on a side
     const size_t stride = size_t(W);
-    const int x0 = R, x1 = W - R;
+    const int n = W - 2 * R;
+    const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
     std::memset(row, 0, size_t(R));
-    std::memset(row + x1, 0, size_t(R));
+    std::memset(row + R + n, 0, size_t(R));
     std::memset(out, 0, stride * size_t(R));
     for (int y = R; y < H - R; ++y) {
-        // Down the columns: acc = c * 100 + sum of (above + below) * w[i].
-        const unsigned char* centre = in + size_t(y) * stride;
-        for (int x = x0; x < x1; ++x) acc[x] = int32_t(centre[x]) * kShadowGaussianCentre;
-        for (int i = 1; i <= R; ++i) {
-            const unsigned char* above = centre - size_t(i) * stride;
-            const unsigned char* below = centre + size_t(i) * stride;
-            const int32_t wi = w[i];
-            for (int x = x0; x < x1; ++x) acc[x] += (int32_t(above[x]) + int32_t(below[x])) * wi;
-        }
-        for (int x = x0; x < x1; ++x) row[x] = static_cast<unsigned char>(acc[x] / S);
-
-        // Along the row, pairing the taps left and right of each sample.
+        // Down the columns into the row, then along the row.
+        blur(in + size_t(y) * stride + R, ptrdiff_t(stride), n, g, false, row + R);
         unsigned char* o = out + size_t(y) * stride;
         std::memset(o, 0, size_t(R));
-        for (int x = x0; x < x1; ++x) acc[x] = int32_t(row[x]) * kShadowGaussianCentre;
-        for (int i = 1; i <= R; ++i) {
-            const int32_t wi = w[i];
-            for (int x = x0; x < x1; ++x) acc[x] += (int32_t(row[x - i]) + int32_t(row[x + i])) * wi;
-        }
-        for (int x = x0; x < x1; ++x) {
-            const int32_t v = acc[x] / S;
-            o[x] = static_cast<unsigned char>(v < 255 ? v : 255);
-        }
-        std::memset(o + x1, 0, size_t(R));
+        blur(row + R, 1, n, g, false, o + R);
+        std::memset(o + R + n, 0, size_t(R));
     }
     std::memset(out + size_t(H - R) * stride, 0, stride * size_t(R));
 }
@@ -158,27 +144,42 @@ void GxOuterShadow::doPostProcessing(GxECore::ParamPostProcessing* p) {
         return;
     const int W = int(planeW), H = int(planeH);
 
-    WorkBuffer<unsigned char> source = AllocateWork<unsigned char>(planeBytes);
-    WorkBuffer<unsigned char> output = AllocateWork<unsigned char>(planeBytes);
-    WorkBuffer<int> weights = AllocateWork<int>(size_t(R) + 1);
-    WorkBuffer<unsigned char> row = AllocateWork<unsigned char>(size_t(W));
-    WorkBuffer<int32_t> acc = AllocateWork<int32_t>(size_t(W));
-    if (!source || !output || !weights || !row || !acc) return;
-    int S = 0;
-    computeGaussianWeights(weights.get(), &S, R);
+    GxGaussian gaussian;
+    if (!PlanGaussian(&gaussian, R, kShadowGaussianCentre, GaussianRounding::kDouble)) return;
+    // Work memory: the stack's when it lends it, else our own for this call.
+    WorkBuffer<unsigned char> ownSource, ownOutput, ownRow;
+    unsigned char* sourcePlane = nullptr;
+    unsigned char* outputPlane = nullptr;
+    unsigned char* row = nullptr;
+    if (p->scratch != nullptr) {
+        sourcePlane = p->scratch->get<unsigned char>(GxScratch::kPlaneA, planeBytes);
+        outputPlane = p->scratch->get<unsigned char>(GxScratch::kPlaneB, planeBytes);
+        row = p->scratch->get<unsigned char>(GxScratch::kRows, size_t(W));
+    } else {
+        ownSource = AllocateWork<unsigned char>(planeBytes);
+        ownOutput = AllocateWork<unsigned char>(planeBytes);
+        ownRow = AllocateWork<unsigned char>(size_t(W));
+        sourcePlane = ownSource.get();
+        outputPlane = ownOutput.get();
+        row = ownRow.get();
+    }
+    if (sourcePlane == nullptr || outputPlane == nullptr || row == nullptr) return;
 
     // The text rectangle inside a frame of M zeros.
-    unsigned char* plane = source.get();
-    std::memset(plane, 0, planeBytes);
+    unsigned char* plane = sourcePlane;
     const int textW = rect.right - rect.left;
+    std::memset(plane, 0, size_t(M) * W);
     for (int y = M; y < H - M; ++y) {
-        std::memcpy(plane + size_t(y) * W + M,
-                    src.pixels + size_t(rect.top + y - M) * src.width + rect.left, size_t(textW));
+        unsigned char* to = plane + size_t(y) * W;
+        std::memset(to, 0, size_t(M));
+        std::memcpy(to + M, src.pixels + size_t(rect.top + y - M) * src.width + rect.left, size_t(textW));
+        std::memset(to + M + textW, 0, size_t(M));
     }
+    std::memset(plane + size_t(H - M) * W, 0, size_t(M) * W);
 
-    BlurPlane(plane, output.get(), W, H, R, weights.get(), S, row.get(), acc.get());
+    BlurPlane(plane, outputPlane, W, H, gaussian, row);
 
-    GxBlender::drawBitmapBlend8(int(x0), int(y0), p->dst, output.get(), W, H, W, property->color,
+    GxBlender::drawBitmapBlend8(int(x0), int(y0), p->dst, outputPlane, W, H, W, property->color,
                                 GxE_BLEND_DST_OVER);
 }
 

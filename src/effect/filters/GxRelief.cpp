@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "effect/GxBlender.h"
+#include "effect/filters/GxBlurRows.h"
 #include "effect/filters/GxGaussian.h"
 #include "effect/filters/GxSqrt.h"
 
@@ -72,55 +73,42 @@ int ReliefPartialBlur(void* raw) {
     auto* job = static_cast<GxReliefBlurJob*>(raw);
     if (job == nullptr || job->src == nullptr || job->dst == nullptr || job->stride <= 0) return 0;
     const int radius = job->radius > 0 ? job->radius : 0;
-    if (radius > kMaxFilterRadius) return -1;  // keeps 255 * total weight well inside 32 bits
+    GxGaussian gaussian;  // keeps 255 * total weight well inside 32 bits
+    if (!PlanGaussian(&gaussian, radius, kShadowGaussianCentre, GaussianRounding::kSingle)) return -1;
     const int x0 = job->x0 > 0 ? job->x0 : 0;
     const int x1 = job->x1 < job->stride ? job->x1 : job->stride;
     if (x0 >= x1 || job->y0 >= job->y1) return 0;
     const size_t stride = size_t(job->stride);
 
-    int* weights = static_cast<int*>(std::malloc(sizeof(int) * (size_t(radius) + 1)));
-    FreeOnExit freeWeights{weights};
     // The row buffer has `radius` zero bytes before column 0 and after the last
     // column, so the horizontal pass never leaves it; inside the frame those are
-    // the zeroed first and last `radius` bytes of a stride-long row.
-    auto* padded = static_cast<unsigned char*>(std::calloc(stride + 2 * size_t(radius), 1));
-    FreeOnExit freePadded{padded};
-    auto* sums = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * stride));
-    FreeOnExit freeSums{sums};
-    if (weights == nullptr || padded == nullptr || sums == nullptr) return -1;
-
-    int total = 0;
-    ComputeGaussianWeights(weights, &total, radius, kShadowGaussianCentre, GaussianRounding::kSingle);
-    const uint32_t divisor = uint32_t(total);
+    // the zeroed first and last `radius` bytes of a stride-long row. Columns
+    // outside [x0, x1) are never written and stay 0.
+    const size_t paddedBytes = stride + 2 * size_t(radius);
+    unsigned char* padded = nullptr;
+    FreeOnExit freePadded{nullptr};
+    if (job->scratch != nullptr) {
+        padded = job->scratch->get<unsigned char>(GxScratch::kRows, paddedBytes, true);
+    } else {
+        padded = static_cast<unsigned char*>(std::calloc(paddedBytes, 1));
+        freePadded.pointer = padded;
+    }
+    if (padded == nullptr) return -1;
     unsigned char* row = padded + radius;
+    const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
+    const int n = x1 - x0;
 
     for (int y = job->y0; y < job->y1; ++y) {
-        // Vertical: acc = 100 * src(x, y) + sum w[i] * (src(x, y - i) + src(x, y + i)).
-        // Summed tap by tap across the row; integer sums, so the order is free.
         const unsigned char* centre = job->src + ptrdiff_t(y) * ptrdiff_t(stride);
-        for (int x = x0; x < x1; ++x) sums[x] = uint32_t(weights[0]) * centre[x];
-        for (int i = 1; i <= radius; ++i) {
-            const unsigned char* up = centre - ptrdiff_t(i) * ptrdiff_t(stride);
-            const unsigned char* down = centre + ptrdiff_t(i) * ptrdiff_t(stride);
-            const uint32_t w = uint32_t(weights[i]);
-            for (int x = x0; x < x1; ++x) sums[x] += w * (uint32_t(up[x]) + down[x]);
-        }
-        for (int x = x0; x < x1; ++x) row[x] = static_cast<unsigned char>(sums[x] / divisor);
-
-        // Horizontal, over the row buffer.
-        unsigned char* out = job->dst + ptrdiff_t(y) * ptrdiff_t(stride);
-        for (int x = x0; x < x1; ++x) {
-            uint32_t acc = uint32_t(weights[0]) * row[x];
-            for (int i = 1; i <= radius; ++i) acc += uint32_t(weights[i]) * (uint32_t(row[x - i]) + row[x + i]);
-            uint32_t v = acc / divisor;
-            out[x] = static_cast<unsigned char>(v > 255 ? 255 : v);
-        }
+        blur(centre + x0, ptrdiff_t(stride), n, gaussian, false, row + x0);
+        blur(row + x0, 1, n, gaussian, false, job->dst + ptrdiff_t(y) * ptrdiff_t(stride) + x0);
     }
     return 0;
 }
 
-int ReliefBlur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height) {
-    GxReliefBlurJob job{src, dst, stride, radius, radius, stride - radius, radius, height - radius};
+int ReliefBlur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height,
+               GxScratch* scratch) {
+    GxReliefBlurJob job{src, dst, stride, radius, radius, stride - radius, radius, height - radius, scratch};
     if (radius < 0) {  // a negative radius would name rows outside the plane
         job.x0 = job.y0 = 0;
         job.x1 = stride;

@@ -8,7 +8,8 @@
 //
 //   - ReliefPartialBlur: the separable integer Gaussian (centre weight 100,
 //     weights rounded in single precision) over a rectangle of a byte plane,
-//     vertical pass into a row buffer, horizontal pass into the destination.
+//     vertical pass into a row buffer, horizontal pass into the destination,
+//     both the shared row kernel of GxBlurRows.
 //     It writes only its rectangle; the rest of the destination keeps what it
 //     held, which the plane rotation below relies on.
 //   - ReliefDT1D / ReliefExactTransform: the lower-envelope squared Euclidean
@@ -42,6 +43,7 @@
 
 #include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
+#include "effect/GxScratch.h"
 #include "effect/filters/GxFilterLimits.h"
 #include "foundation/GxBitmap.h"
 #include "foundation/GxRect.h"
@@ -107,6 +109,7 @@ inline unsigned ReliefMaskAt(const GxBitmap& mask, int64_t x, int64_t y) {
 
 // Blur job: a rectangle [x0, x1) x [y0, y1) of byte planes `stride` bytes
 // wide. The caller keeps rows y0 - radius .. y1 + radius - 1 inside `src`.
+// With `scratch` the row buffer comes from its kRows slot.
 struct GxReliefBlurJob {
     const unsigned char* src;
     unsigned char* dst;
@@ -114,12 +117,14 @@ struct GxReliefBlurJob {
     int radius;
     int x0, x1;
     int y0, y1;
+    GxScratch* scratch = nullptr;
 };
 
 // 0 when done; -1 (nothing written) when its scratch could not be had.
 int ReliefPartialBlur(void* job);
 // One job over [radius, stride - radius) x [radius, height - radius).
-int ReliefBlur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height);
+int ReliefBlur(const unsigned char* src, unsigned char* dst, int stride, int radius, int height,
+               GxScratch* scratch = nullptr);
 
 // ---- distance transforms
 

@@ -1,0 +1,133 @@
+// The blur row kernel, once per instruction set (see GxBlurRows.h).
+//
+// Vector form: 8-bit taps are widened to 16 bits, the two taps of a pair
+// added (at most 510) and multiplied by their weight (at most 128, so the
+// product stays below 2^16), and the products summed in 32-bit lanes, half a
+// vector each. The division is GxDivisor's (x * m) >> s with a 64-bit product:
+// even and odd 32-bit lanes are multiplied apart (MulEven) and put back
+// together. Columns past the last whole vector take the scalar form of the
+// same arithmetic, as does the whole row in the fallback build for x86-64 CPUs
+// without SSE4 (Highway's one-lane "scalar" target).
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "effect/filters/GxBlurRows.cpp"
+#include <hwy/foreach_target.h>  // IWYU pragma: keep
+#include <hwy/highway.h>
+
+#include "effect/filters/GxBlurRows.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace Glimmer::BlurRows::HWY_NAMESPACE {
+namespace hn = hwy::HWY_NAMESPACE;
+
+#if HWY_TARGET != HWY_SCALAR
+// Quotient lanes of a 32-bit vector, exact for sums up to 255 * S.
+template <class D32, class V32 = hn::Vec<D32>>
+HWY_INLINE V32 Divide(D32 d32, V32 x, V32 multiplier, int shift) {
+    const hn::Repartition<uint64_t, D32> d64;
+    auto even = hn::MulEven(x, multiplier);
+    auto odd = hn::MulEven(hn::BitCast(d32, hn::ShiftRight<32>(hn::BitCast(d64, x))), multiplier);
+    even = hn::ShiftRightSame(even, shift);
+    odd = hn::ShiftRightSame(odd, shift);
+    return hn::BitCast(d32, hn::Or(even, hn::ShiftLeft<32>(odd)));
+}
+#endif
+
+void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted,
+             uint8_t* HWY_RESTRICT out) {
+    const int R = g.radius;
+    const int* w = g.weights;
+    int x = 0;
+#if HWY_TARGET != HWY_SCALAR
+    const hn::ScalableTag<uint16_t> d16;
+    const hn::Rebind<uint8_t, decltype(d16)> d8;
+    const hn::Half<decltype(d16)> dh16;
+    const hn::Rebind<uint32_t, decltype(dh16)> d32;
+    const hn::Rebind<int32_t, decltype(dh16)> di32;
+    const hn::Rebind<uint8_t, decltype(dh16)> dh8;
+    const int N = int(hn::Lanes(d16));
+    const int half = int(hn::Lanes(d32));
+    const auto multiplier = hn::Set(d32, uint32_t(g.divide.multiplier));
+    const int shift = int(g.divide.shift);
+    const auto full = hn::Set(d32, g.full);
+    const auto most = hn::Set(d32, 255u);
+    for (; x + N <= n; x += N) {
+        const auto centre = hn::Mul(hn::PromoteTo(d16, hn::LoadU(d8, c + x)), hn::Set(d16, uint16_t(w[0])));
+        auto lo = hn::PromoteTo(d32, hn::LowerHalf(dh16, centre));
+        auto hi = hn::PromoteTo(d32, hn::UpperHalf(dh16, centre));
+        for (int i = 1; i <= R; ++i) {
+            const ptrdiff_t offset = ptrdiff_t(i) * step;
+            const auto pair = hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, c + x - offset)),
+                                      hn::PromoteTo(d16, hn::LoadU(d8, c + x + offset)));
+            const auto product = hn::Mul(pair, hn::Set(d16, uint16_t(w[i])));
+            lo = hn::Add(lo, hn::PromoteTo(d32, hn::LowerHalf(dh16, product)));
+            hi = hn::Add(hi, hn::PromoteTo(d32, hn::UpperHalf(dh16, product)));
+        }
+        if (inverted) {
+            lo = hn::Sub(full, lo);
+            hi = hn::Sub(full, hi);
+        }
+        lo = hn::Min(Divide(d32, lo, multiplier, shift), most);
+        hi = hn::Min(Divide(d32, hi, multiplier, shift), most);
+        hn::StoreU(hn::DemoteTo(dh8, hn::BitCast(di32, lo)), dh8, out + x);
+        hn::StoreU(hn::DemoteTo(dh8, hn::BitCast(di32, hi)), dh8, out + x + half);
+    }
+#endif
+    // The columns past the last whole vector; the whole row in the build for
+    // CPUs without the vector instructions.
+    for (; x < n; ++x) {
+        uint32_t sum = uint32_t(w[0]) * c[x];
+        for (int i = 1; i <= R; ++i) {
+            const ptrdiff_t offset = ptrdiff_t(i) * step;
+            sum += uint32_t(w[i]) * (uint32_t(c[x - offset]) + c[x + offset]);
+        }
+        const uint32_t v = g.divide(inverted ? g.full - sum : sum);
+        out[x] = uint8_t(v < 255 ? v : 255);
+    }
+}
+
+const Table* GetTable() {
+    static const Table table = {BlurRow};
+    return &table;
+}
+
+}  // namespace Glimmer::BlurRows::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+#include "effect/GxKernelTargets.h"
+
+namespace Glimmer::BlurRows {
+
+namespace Reference {
+void BlurRow(const uint8_t* c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted, uint8_t* out) {
+    for (int x = 0; x < n; ++x) {
+        uint32_t sum = uint32_t(g.weights[0]) * c[x];
+        for (int i = 1; i <= g.radius; ++i) {
+            const ptrdiff_t offset = ptrdiff_t(i) * step;
+            sum += uint32_t(g.weights[i]) * (uint32_t(c[x - offset]) + c[x + offset]);
+        }
+        const uint32_t v = (inverted ? g.full - sum : sum) / g.sum;
+        out[x] = uint8_t(v < 255 ? v : 255);
+    }
+}
+}  // namespace Reference
+
+const Table& ReferenceTable() {
+    static const Table table = {Reference::BlurRow};
+    return table;
+}
+
+HWY_EXPORT(GetTable);
+
+const Table& Active() {
+    static const Table* table = HWY_DYNAMIC_DISPATCH(GetTable)();
+    return *table;
+}
+
+std::vector<Variant> Variants() {
+    return KernelTargets::EachTarget<Variant>([] { return HWY_DYNAMIC_DISPATCH(GetTable)(); });
+}
+
+}  // namespace Glimmer::BlurRows
+#endif  // HWY_ONCE

@@ -1,0 +1,51 @@
+#pragma once
+// The one tap loop of every Gaussian blur in the engine (outer and inner
+// shadow, glows, reliefs). A separable blur is two passes of the same row
+// kernel: down the columns the taps of output x are the samples x - i * stride
+// and x + i * stride of the rows above and below, along a row they are x - i
+// and x + i. So the kernel takes the distance between taps as `step`:
+//
+//     sum = w[0] * c[x] + sum over i = 1..R of w[i] * (c[x - i*step] + c[x + i*step])
+//     out[x] = min(sum / S, 255), or min((255 * S - sum) / S, 255) when inverted
+//
+// for x in [0, n). Every tap must be readable: the caller keeps R steps of
+// samples on either side. The quotient never exceeds 255 (the sum is at most
+// 255 * S), so the clamp is only the rule written out.
+//
+// The literal loop, with a division per sample, is the reference; the kernels
+// in use (Active()) divide by multiply and shift (GxDivisor) and are vectorised
+// with Highway, chosen at run time on x86-64 (SSE4, AVX2, AVX-512) and NEON on
+// 64-bit Arm. They give the reference's bytes for every input.
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "effect/filters/GxGaussian.h"
+
+namespace Glimmer::BlurRows {
+
+using BlurRow = void (*)(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian,
+                         bool inverted, uint8_t* out);
+
+struct Table {
+    BlurRow blurRow;
+};
+
+namespace Reference {
+void BlurRow(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian, bool inverted,
+             uint8_t* out);
+}  // namespace Reference
+
+const Table& ReferenceTable();
+// The kernels in use.
+const Table& Active();
+
+// Every compiled variant this CPU can run, for the tests.
+struct Variant {
+    const char* name;
+    const Table* table;
+};
+std::vector<Variant> Variants();
+
+}  // namespace Glimmer::BlurRows
