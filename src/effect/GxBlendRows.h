@@ -2,14 +2,29 @@
 // Row kernels of the compositor and of the stack's final merge. Each works
 // on one run of n >= 1 pixels that the caller has already clipped, so a
 // vectorised twin only has to reproduce the per-pixel arithmetic: the
-// compositor and the stack call through the table that Active() returns,
-// and a twin is installed there without touching any caller.
+// compositor and the stack call through the table that Active() returns, the
+// Highway twins for the CPU at hand (SSE4, AVX2, AVX-512 on x86-64, NEON on
+// 64-bit Arm), and the scalar kernels stay as their reference.
 //
 // 32-bit destinations are bytes R, G, B, A. Colour arguments are 0xAARRGGBB.
 
+#include <array>
 #include <cstdint>
+#include <vector>
 
 namespace Glimmer::BlendRows {
+
+// The final unpremultiply divides 256 q by the new alpha a (q, a < 256). With
+// r[a] = ceil(2^24 / a), floor(256 q / a) == (q * r[a]) >> 16: the product
+// overshoots 2^8 q / a by q * (a r[a] - 2^24) / (a 2^16) <= q (a - 1) / (a 2^16),
+// below 1 / a because q (a - 1) < 2^16, and the fraction of 256 q / a is at
+// most (a - 1) / a. r[0] = 0 makes a transparent pixel's colour 0, as the rule
+// wants.
+inline constexpr std::array<uint32_t, 256> kReciprocals = [] {
+    std::array<uint32_t, 256> r{};
+    for (uint32_t a = 1; a < 256; ++a) r[a] = ((1u << 24) + a - 1) / a;
+    return r;
+}();
 
 using Rows8To32 = void (*)(uint8_t* dst, const uint8_t* coverage, int n, uint32_t color);
 using Rows8To8 = void (*)(uint8_t* dst, const uint8_t* coverage, int n);
@@ -56,5 +71,12 @@ void UnpremultiplySwap(uint8_t* pixels, int n, uint32_t alpha);
 const Table& ScalarTable();
 // The kernels in use.
 const Table& Active();
+
+// Every compiled variant this CPU can run, for the tests.
+struct Variant {
+    const char* name;
+    const Table* table;
+};
+std::vector<Variant> Variants();
 
 }  // namespace Glimmer::BlendRows

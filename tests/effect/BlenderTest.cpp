@@ -274,27 +274,5 @@ TEST(BlenderProperties, DestinationOverNeverChangesAnOpaquePixel) {
     EXPECT_EQ(std::vector<uint8_t>(b.pixels, b.pixels + 256 * 4), before);
 }
 
-TEST(BlenderProperties, RowKernelsHandleEveryLengthWithoutTouchingNeighbours) {
-    // The shape a vectorised twin must also keep: exactly n pixels written.
-    const BlendRows::Table& t = BlendRows::Active();
-    for (int n = 1; n <= 40; ++n) {
-        std::vector<uint8_t> dst((n + 2) * 4, 0xA5), cov(n + 2, 200);
-        std::vector<uint32_t> words(n + 2, 0x80808080u);
-        uint8_t* d = dst.data() + 4;
-        t.srcOver8To32(d, cov.data(), n, 0xFF102030);
-        t.dstOver8To32(d, cov.data(), n, 0xFF102030);
-        t.dstOverSA8To32(d, cov.data(), n, 0xFF102030);
-        t.copy8To32(d, cov.data(), n, 0xFF102030);
-        t.dstOver32To32(d, words.data(), n);
-        t.srcOver32To32(d, words.data(), n);
-        t.swapRedBlue(d, n);
-        t.unpremultiply(d, n, 200);
-        for (int c = 0; c < 4; ++c) {
-            ASSERT_EQ(dst[c], 0xA5) << n;
-            ASSERT_EQ(dst[(n + 1) * 4 + c], 0xA5) << n;
-        }
-    }
-}
-
 }  // namespace
 }  // namespace Glimmer
