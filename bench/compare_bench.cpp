@@ -17,7 +17,8 @@
 // Frames alternate between the two engines on one core; the table gives the
 // median time of each, their ratio and, when valgrind is installed, the
 // instructions per frame that callgrind counts (each engine run apart, in a
-// child process). "allocs" is the number of heap allocations a Glimmer frame
+// child process; valgrind runs no AVX-512, so there the kernels take their
+// AVX2 build). "allocs" is the number of heap allocations a Glimmer frame
 // makes once the text object has rendered the same size before.
 //
 //   compare_bench [--frames N] [--scene NAME] [--no-instructions] [--smoke]

@@ -18,7 +18,7 @@ packages=(
   # the Java bridge: JNI headers, javac and the JVM its tests run on
   openjdk-17-jdk-headless
   # the same libraries for the Arm build, installed beside the native ones
-  libharfbuzz-dev:arm64 libfreetype-dev:arm64 libfontconfig-dev:arm64 libhwy-dev:arm64
+  libharfbuzz-dev:arm64 libfreetype-dev:arm64 libfontconfig-dev:arm64
   # the command-line renderer: PNG files, line breaking, JSON effect files
   libpng-dev libicu-dev nlohmann-json3-dev libpng-dev:arm64 libicu-dev:arm64
 )

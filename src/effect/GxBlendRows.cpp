@@ -550,16 +550,14 @@ const Table& ScalarTable() {
     return table;
 }
 
-HWY_EXPORT(GetTable);
+#include "effect/GxKernelBuilds.inc"
 
 const Table& Active() {
-    static const Table* table = HWY_DYNAMIC_DISPATCH(GetTable)();
+    static const Table* table = KernelTargets::Choose<Table>(kBuilds);
     return *table;
 }
 
-std::vector<Variant> Variants() {
-    return KernelTargets::EachTarget<Variant>([] { return HWY_DYNAMIC_DISPATCH(GetTable)(); });
-}
+std::vector<Variant> Variants() { return KernelTargets::All<Variant>(kBuilds); }
 
 }  // namespace Glimmer::BlendRows
 #endif  // HWY_ONCE

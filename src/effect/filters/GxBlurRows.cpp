@@ -118,16 +118,14 @@ const Table& ReferenceTable() {
     return table;
 }
 
-HWY_EXPORT(GetTable);
+#include "effect/GxKernelBuilds.inc"
 
 const Table& Active() {
-    static const Table* table = HWY_DYNAMIC_DISPATCH(GetTable)();
+    static const Table* table = KernelTargets::Choose<Table>(kBuilds);
     return *table;
 }
 
-std::vector<Variant> Variants() {
-    return KernelTargets::EachTarget<Variant>([] { return HWY_DYNAMIC_DISPATCH(GetTable)(); });
-}
+std::vector<Variant> Variants() { return KernelTargets::All<Variant>(kBuilds); }
 
 }  // namespace Glimmer::BlurRows
 #endif  // HWY_ONCE
