@@ -19,7 +19,8 @@
 // instructions per frame that callgrind counts (each engine run apart, in a
 // child process; valgrind runs no AVX-512, so there the kernels take their
 // AVX2 build). "allocs" is the number of heap allocations a Glimmer frame
-// makes once the text object has rendered the same size before.
+// makes once the text object has rendered the same size before: shaping and
+// glyph drawing, and whatever the effect layers still allocate.
 //
 //   compare_bench [--frames N] [--scene NAME] [--no-instructions] [--smoke]
 
@@ -33,7 +34,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <atomic>
 #include <cstdarg>
 #include <chrono>
 #include <cstdio>
@@ -44,41 +44,13 @@
 #include <string>
 #include <vector>
 
+#include "AllocationCounter.h"
 #include "effect/GxEffect.h"
 #include "font/SystemFontFamilies.h"
 #include "foundation/List.h"
 #include "text/GxLineInfo.h"
 #include "text/GxTextObject.h"
 #include "text/GxView.h"
-
-// ---- heap allocations, counted while `gCounting` is set
-
-extern "C" void* __libc_malloc(size_t);
-extern "C" void* __libc_calloc(size_t, size_t);
-extern "C" void* __libc_realloc(void*, size_t);
-extern "C" void __libc_free(void*);
-
-namespace {
-std::atomic<bool> gCounting{false};
-std::atomic<long> gAllocations{0};
-inline void CountOne() {
-    if (gCounting.load(std::memory_order_relaxed)) gAllocations.fetch_add(1, std::memory_order_relaxed);
-}
-}  // namespace
-
-extern "C" void* malloc(size_t n) {
-    CountOne();
-    return __libc_malloc(n);
-}
-extern "C" void* calloc(size_t n, size_t size) {
-    CountOne();
-    return __libc_calloc(n, size);
-}
-extern "C" void* realloc(void* p, size_t n) {
-    CountOne();
-    return __libc_realloc(p, n);
-}
-extern "C" void free(void* p) { __libc_free(p); }
 
 namespace {
 
@@ -371,12 +343,10 @@ int main(int argc, char** argv) {
             std::fprintf(stderr, "%s: a renderer failed\n", s.name);
             return 1;
         }
-        // Allocations of a frame of a size rendered before.
-        gAllocations = 0;
-        gCounting = true;
+        // Allocations of a frame of a size rendered before (twice: the text
+        // object's two images take turns).
         GlimmerFrame(g);
-        gCounting = false;
-        const long allocations = gAllocations;
+        const long allocations = Bench::AllocationsOf([&] { GlimmerFrame(g); });
 
         std::vector<double> glimmer, ass;
         for (int i = 0; i < frames; ++i) {

@@ -459,14 +459,21 @@ void GxEffect::orderLayers() {
         return;
     }
     // Over the text (newest first), the text, under the text (newest first).
-    // Built in place over the copy of `layers` already held, so no allocation.
+    // Built in place over the copy of `layers` already held, so no allocation
+    // (std::stable_partition would take a buffer; a dozen layers are rotated
+    // into place instead).
     std::vector<GxECoreBase*>& order = renderOrder;
     std::reverse(order.begin(), order.end());
     auto isText = [](GxECoreBase* l) { return l->getStyle() == GxECore::kText; };
-    auto over = std::stable_partition(order.begin(), order.end(), [&](GxECoreBase* l) {
+    auto partition = [](auto first, auto last, auto pred) {
+        for (auto it = first; it != last; ++it)
+            if (pred(*it)) std::rotate(first++, it, it + 1);
+        return first;
+    };
+    auto over = partition(order.begin(), order.end(), [&](GxECoreBase* l) {
         return !isText(l) && !isUnderText(l);
     });
-    auto textEnd = std::stable_partition(over, order.end(), isText);
+    auto textEnd = partition(over, order.end(), isText);
     // The text group was gathered newest first; it runs in creation order.
     std::reverse(over, textEnd);
 }

@@ -14,11 +14,14 @@ GxText::~GxText() { delete property; }
 
 void GxText::setProperty(GxProperty* p) {
     if (p == nullptr) return;
-    // Only the colour and opacity every record carries are needed.
-    auto* copy = new (std::nothrow) GxTextProperty(p->color, p->opacity);
-    if (copy == nullptr) return;
-    delete property;
-    property = copy;
+    // Only the colour and opacity every record carries are needed. The text
+    // object sets them before every render, so the record is kept and
+    // overwritten.
+    if (property != nullptr) {
+        *property = GxTextProperty(p->color, p->opacity);
+        return;
+    }
+    property = new (std::nothrow) GxTextProperty(p->color, p->opacity);
 }
 
 GxProperty* GxText::getProperty() { return property; }
