@@ -24,7 +24,9 @@
 // reference's order of precedence. The one product that can pass 16 bits (the
 // text fill's (sum + 1) * m, up to 511 * 255) saturates through its high half.
 // The final unpremultiply divides by the new alpha through kReciprocals (see
-// GxBlendRows.h) with 32-bit products. Pixels past the last whole vector go to
+// GxBlendRows.h) with 32-bit products. Blocks that cannot change are passed
+// over: no coverage at all, or (unpremultiply with the text fully opaque)
+// only opaque and clear pixels. Pixels past the last whole vector go to
 // the reference, as does every row in the fallback build for x86-64 CPUs
 // without SSE4 (Highway's one-lane "scalar" target).
 
@@ -90,6 +92,10 @@ HWY_INLINE Px Select(hn::Mask<D16> m, const Px& yes, const Px& no) {
 }
 HWY_INLINE Px ColourOf(uint32_t c) { return {Const((c >> 16) & 0xFF), Const((c >> 8) & 0xFF), Const(c & 0xFF), Const(c >> 24)}; }
 
+// No coverage in the whole block: every coverage kernel but the copy leaves
+// such pixels as they are, so the block is not touched at all.
+HWY_INLINE bool NoCoverage(V m) { return hn::AllTrue(D16(), hn::Eq(m, hn::Zero(D16()))); }
+
 // Runs `block` over whole vectors of pixels and the reference over the rest;
 // returns the pixel index where the rest starts.
 template <typename Block>
@@ -104,9 +110,10 @@ void SrcOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c = ColourOf(color);
     const V a1 = Const((color >> 24) + 1);
     const int done = Blocks(n, [&](int i) {
+        const V m = Coverage(cov + i);
+        if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
         const Px D = LoadPx(p);
-        const V m = Coverage(cov + i);
         const V s = hn::Mul(a1, m);
         const V a = hn::ShiftRight<8>(s);
         const V k = hn::Sub(Const(255), a);
@@ -121,9 +128,10 @@ void SrcOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
 void DstOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c = ColourOf(color);
     const int done = Blocks(n, [&](int i) {
+        const V m = Coverage(cov + i);
+        if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
         const Px D = LoadPx(p);
-        const V m = Coverage(cov + i);
         const Px S = {Scale(c.r, m), Scale(c.g, m), Scale(c.b, m), Scale(c.a, m)};
         const V k = hn::Sub(Const(255), D.a);
         const Px under = {Min255(hn::Add(D.r, Scale(S.r, k))), Min255(hn::Add(D.g, Scale(S.g, k))),
@@ -137,9 +145,10 @@ void DstOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
 void DstOver8To32NSA(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c = ColourOf(color);
     const int done = Blocks(n, [&](int i) {
+        const V m = Coverage(cov + i);
+        if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
         const Px D = LoadPx(p);
-        const V m = Coverage(cov + i);
         const V k = hn::Sub(Const(255), D.a);
         const Px under = {Min255(hn::Add(D.r, Scale(c.r, k))), Min255(hn::Add(D.g, Scale(c.g, k))),
                           Min255(hn::Add(D.b, Scale(c.b, k))), Min255(hn::Add(D.a, Scale(c.a, k)))};
@@ -155,9 +164,10 @@ void DstOverSA8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
                    Const((color >> 24) + 1)};
     const V one = Const(1);
     const int done = Blocks(n, [&](int i) {
+        const V m = Coverage(cov + i);
+        if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
         const Px D = LoadPx(p);
-        const V m = Coverage(cov + i);
         // (v + 1) * m stays below 2^16 for bytes: no saturation needed here.
         const Px S = {hn::ShiftRight<8>(hn::Mul(c1.r, m)), hn::ShiftRight<8>(hn::Mul(c1.g, m)),
                       hn::ShiftRight<8>(hn::Mul(c1.b, m)), hn::ShiftRight<8>(hn::Mul(c1.a, m))};
@@ -271,8 +281,35 @@ void UnpremultiplyRows(uint8_t* d, int n, uint32_t alpha) {
         auto qh = hn::Min(hn::ShiftRight<16>(hn::Mul(hn::PromoteTo(d32, hn::UpperHalf(dh, q)), hi)), most);
         return hn::Combine(D16(), hn::DemoteTo(dh, hn::BitCast(di32, qh)), hn::DemoteTo(dh, hn::BitCast(di32, ql)));
     };
+    const hn::ScalableTag<uint32_t> dw;
+    const size_t words = hn::Lanes(dw);  // half a block
+    const bool plain = (alpha & 0xFF) == 255;
+    // With t = 255 an opaque pixel stays as it is (q = v, and 256 v / 255
+    // rounds down to v, 255 clamped from 256) and a transparent one becomes 0:
+    // a block of only those needs no division. Returns false for other blocks.
+    auto opaqueOrClear = [&](uint8_t* p) {
+        auto* w = reinterpret_cast<uint32_t*>(p);
+        const auto w0 = hn::LoadU(dw, w), w1 = hn::LoadU(dw, w + words);
+        const auto a0 = hn::ShiftRight<24>(w0), a1 = hn::ShiftRight<24>(w1);
+        const auto zero = hn::Zero(dw), full = hn::Set(dw, 255u);
+        if (!hn::AllTrue(dw, hn::Or(hn::Eq(a0, zero), hn::Eq(a0, full))) ||
+            !hn::AllTrue(dw, hn::Or(hn::Eq(a1, zero), hn::Eq(a1, full))))
+            return false;
+        auto finish = [&](hn::Vec<decltype(dw)> v) {
+            if (kSwap) {
+                const auto keep = hn::And(v, hn::Set(dw, 0xFF00FF00u));
+                v = hn::Or(keep, hn::Or(hn::ShiftLeft<16>(hn::And(v, hn::Set(dw, 0xFFu))),
+                                        hn::And(hn::ShiftRight<16>(v), hn::Set(dw, 0xFFu))));
+            }
+            return v;
+        };
+        hn::StoreU(hn::IfThenZeroElse(hn::Eq(a0, zero), finish(w0)), dw, w);
+        hn::StoreU(hn::IfThenZeroElse(hn::Eq(a1, zero), finish(w1)), dw, w + words);
+        return true;
+    };
     const int done = Blocks(n, [&](int i) {
         uint8_t* p = d + 4 * size_t(i);
+        if (plain && opaqueOrClear(p)) return;
         const Px D = LoadPx(p);
         const V a = Scale(D.a, t);
         const auto lo = hn::GatherIndex(d32, kReciprocals.data(), hn::BitCast(di32, hn::PromoteTo(d32, hn::LowerHalf(dh, a))));
