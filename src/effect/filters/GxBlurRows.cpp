@@ -86,8 +86,34 @@ void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGauss
     }
 }
 
+void SpreadRow(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT row,
+               const uint8_t* HWY_RESTRICT below, int width, uint8_t* HWY_RESTRICT out) {
+    int x = 1;
+#if HWY_TARGET != HWY_SCALAR
+    // Column sums up to 765, their sum of three up to 2295: 16-bit lanes.
+    const hn::ScalableTag<uint16_t> d16;
+    const hn::Rebind<uint8_t, decltype(d16)> d8;
+    const int N = int(hn::Lanes(d16));
+    auto column = [&](int at) {
+        return hn::Add(hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, above + at)), hn::PromoteTo(d16, hn::LoadU(d8, row + at))),
+                       hn::PromoteTo(d16, hn::LoadU(d8, below + at)));
+    };
+    for (; x + N + 1 <= width; x += N) {
+        const auto sum = hn::Add(hn::Add(column(x - 1), column(x)), column(x + 1));
+        const auto v = hn::Min(hn::ShiftRight<2>(sum), hn::Set(d16, 255));
+        hn::StoreU(hn::DemoteTo(d8, hn::BitCast(hn::Rebind<int16_t, decltype(d16)>(), v)), d8, out + x);
+    }
+#endif
+    for (; x + 1 < width; ++x) {
+        unsigned s = 0;
+        for (int k = -1; k <= 1; ++k) s += unsigned(above[x + k]) + row[x + k] + below[x + k];
+        s >>= 2;
+        out[x] = uint8_t(s > 255 ? 255 : s);
+    }
+}
+
 const Table* GetTable() {
-    static const Table table = {BlurRow};
+    static const Table table = {BlurRow, SpreadRow};
     return &table;
 }
 
@@ -111,10 +137,18 @@ void BlurRow(const uint8_t* c, ptrdiff_t step, int n, const GxGaussian& g, bool 
         out[x] = uint8_t(v < 255 ? v : 255);
     }
 }
+void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out) {
+    for (int x = 1; x + 1 < width; ++x) {
+        unsigned s = 0;
+        for (int k = -1; k <= 1; ++k) s += unsigned(above[x + k]) + row[x + k] + below[x + k];
+        s >>= 2;
+        out[x] = uint8_t(s > 255 ? 255 : s);
+    }
+}
 }  // namespace Reference
 
 const Table& ReferenceTable() {
-    static const Table table = {Reference::BlurRow};
+    static const Table table = {Reference::BlurRow, Reference::SpreadRow};
     return table;
 }
 

@@ -1,6 +1,6 @@
 #pragma once
 // The one tap loop of every Gaussian blur in the engine (outer and inner
-// shadow, glows, reliefs). A separable blur is two passes of the same row
+// shadow, glows, reliefs), and the glow's 3 x 3 spread. A separable blur is two passes of the same row
 // kernel: down the columns the taps of output x are the samples x - i * stride
 // and x + i * stride of the rows above and below, along a row they are x - i
 // and x + i. So the kernel takes the distance between taps as `step`:
@@ -27,14 +27,21 @@ namespace Glimmer::BlurRows {
 
 using BlurRow = void (*)(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian,
                          bool inverted, uint8_t* out);
+// The glow's spread: for x in [1, width - 1), out[x] = min(255, s >> 2) with s
+// the sum of the 3 x 3 samples around x in the rows above, at and below.
+// out[0] and out[width - 1] are not written. width >= 3.
+using SpreadRow = void (*)(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width,
+                           uint8_t* out);
 
 struct Table {
     BlurRow blurRow;
+    SpreadRow spreadRow;
 };
 
 namespace Reference {
 void BlurRow(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian, bool inverted,
              uint8_t* out);
+void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out);
 }  // namespace Reference
 
 const Table& ReferenceTable();

@@ -104,34 +104,27 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height) 
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch) {
     if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
     const size_t w = size_t(width);
-    // Three rows: the saved row above, the output row, the column sums.
+    // Two rows: the saved row above and the output row.
     WorkBuffer<unsigned char> own;
     unsigned char* rows = nullptr;
     if (scratch != nullptr) {
-        rows = scratch->get<unsigned char>(GxScratch::kRows, 4 * w);
+        rows = scratch->get<unsigned char>(GxScratch::kRows, 2 * w);
     } else {
-        own = AllocateWork<unsigned char>(4 * w);
+        own = AllocateWork<unsigned char>(2 * w);
         rows = own.get();
     }
     if (rows == nullptr) return false;
     unsigned char* saved = rows;
     unsigned char* out = rows + w;
-    auto* columns = reinterpret_cast<uint16_t*>(rows + 2 * w);  // the block is 64-byte aligned, 2w even
     out[0] = 0;
     out[w - 1] = 0;
+    const BlurRows::SpreadRow spread = BlurRows::Active().spreadRow;
     for (int pass = 0; pass < iterations; ++pass) {
         // `saved` holds the row above as it was before this pass rewrote it.
         std::memcpy(saved, plane, w);
         for (int y = 1; y < height - 1; ++y) {
             unsigned char* row = plane + size_t(y) * w;
-            const unsigned char* below = row + w;
-            for (size_t x = 0; x < w; ++x) columns[x] = uint16_t(saved[x] + row[x] + below[x]);
-            // The 3 x 3 sum is the sum of three column sums: the same integer.
-            for (size_t x = 1; x + 1 < w; ++x) {
-                unsigned s = unsigned(columns[x - 1]) + columns[x] + columns[x + 1];
-                s >>= 2;
-                out[x] = uint8_t(s > 255 ? 255 : s);
-            }
+            if (w >= 3) spread(saved, row, row + w, width, out);
             std::memcpy(saved, row, w);
             std::memcpy(row, out, w);
         }

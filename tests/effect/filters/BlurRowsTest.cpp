@@ -103,5 +103,31 @@ TEST(BlurRows, EveryKernelGivesTheReferenceBytes) {
     }
 }
 
+// The glow's spread beside its reference, likewise: three random rows, every
+// width from 3 to 66 and some long ones, the two end bytes left alone.
+TEST(BlurRows, EverySpreadKernelGivesTheReferenceBytes) {
+    std::mt19937 random(11);
+    auto bytes = [&](size_t n) {
+        std::vector<uint8_t> v(n);
+        for (auto& b : v) b = uint8_t(random() % 3 == 0 ? 255 : random());
+        return v;
+    };
+    std::vector<int> widths;
+    for (int w = 3; w <= 66; ++w) widths.push_back(w);
+    widths.insert(widths.end(), {201, 1032, 4100});
+    for (int w : widths) {
+        const std::vector<uint8_t> rows = bytes(3 * size_t(w));
+        const uint8_t* above = rows.data();
+        std::vector<uint8_t> expected = bytes(size_t(w));
+        const std::vector<uint8_t> poison = expected;
+        BlurRows::Reference::SpreadRow(above, above + w, above + 2 * w, w, expected.data());
+        for (const auto& v : BlurRows::Variants()) {
+            std::vector<uint8_t> got = poison;
+            v.table->spreadRow(above, above + w, above + 2 * w, w, got.data());
+            ASSERT_EQ(got, expected) << v.name << " width " << w;
+        }
+    }
+}
+
 }  // namespace
 }  // namespace Glimmer
