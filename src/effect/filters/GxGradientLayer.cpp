@@ -26,17 +26,24 @@ bool GxGradientLayer::beginFill(GxECore::ParamPostProcessing* p, Fill* fill) {
     fill->height = fill->box.bottom - fill->box.top;
     if (!BuildGradientTable(fill->table, property->stops, property->count)) return false;
     for (uint32_t& entry : fill->table) entry = PremultiplyColor(entry);
-    fill->image = AllocateWork<uint32_t>(size_t(fill->width) * size_t(fill->height), true);
-    if (!fill->image) return false;
+    const size_t pixels = size_t(fill->width) * size_t(fill->height);
+    if (p->scratch != nullptr) {
+        fill->image = p->scratch->get<uint32_t>(GxScratch::kPlaneA, pixels, true);
+    } else {
+        fill->ownImage = AllocateWork<uint32_t>(pixels, true);
+        fill->image = fill->ownImage.get();
+    }
+    if (fill->image == nullptr) return false;
     fill->maskStride = p->src->width;
     fill->mask = p->src->pixels + size_t(fill->box.top) * fill->maskStride + size_t(fill->box.left);
     return true;
 }
 
 void GxGradientLayer::endFill(GxECore::ParamPostProcessing* p, Fill* fill) {
-    GxBlender::drawBitmapBlend32(fill->box.left, fill->box.top, p->dst, fill->image.get(), fill->width,
+    GxBlender::drawBitmapBlend32(fill->box.left, fill->box.top, p->dst, fill->image, fill->width,
                                  fill->height, fill->width, GxE_BLEND_DST_OVER);
-    fill->image.reset();
+    fill->image = nullptr;
+    fill->ownImage.reset();
 }
 
 }  // namespace Glimmer

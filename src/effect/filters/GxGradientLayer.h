@@ -37,12 +37,13 @@ protected:
         int32_t width = 0;       // W
         int32_t height = 0;      // H
         uint32_t table[kColorTableSize];  // premultiplied 0xAARRGGBB
-        WorkBuffer<uint32_t> image;       // W x H, cleared to transparent
+        uint32_t* image = nullptr;        // W x H, cleared to transparent: the stack's
+        WorkBuffer<uint32_t> ownImage;    // scratch, or this when it lends none
         const unsigned char* mask = nullptr;  // mask row of the box's top, from its left
         size_t maskStride = 0;
 
         const unsigned char* MaskRow(int32_t y) const { return mask + size_t(y) * maskStride; }
-        uint32_t* ImageRow(int32_t y) { return image.get() + size_t(y) * size_t(width); }
+        uint32_t* ImageRow(int32_t y) { return image + size_t(y) * size_t(width); }
     };
 
     GxGradientLayer() = default;

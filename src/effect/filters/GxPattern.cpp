@@ -85,9 +85,21 @@ void GxPattern::doPostProcessing(GxECore::ParamPostProcessing* p) {
     const int32_t tw = TruncToInt(scale * float(bw));
     const int32_t th = TruncToInt(scale * float(bh));
 
-    WorkBuffer<uint32_t> image = AllocateWork<uint32_t>(size_t(W) * size_t(H), true);
-    WorkBuffer<Sample> columns = AllocateWork<Sample>(size_t(W));
-    if (!image || !columns) return;
+    // Work memory: the stack's when it lends it, else our own for this call.
+    WorkBuffer<uint32_t> ownImage;
+    WorkBuffer<Sample> ownColumns;
+    uint32_t* image = nullptr;
+    Sample* columns = nullptr;
+    if (p->scratch != nullptr) {
+        image = p->scratch->get<uint32_t>(GxScratch::kPlaneA, size_t(W) * size_t(H), true);
+        columns = p->scratch->get<Sample>(GxScratch::kRows, size_t(W));
+    } else {
+        ownImage = AllocateWork<uint32_t>(size_t(W) * size_t(H), true);
+        ownColumns = AllocateWork<Sample>(size_t(W));
+        image = ownImage.get();
+        columns = ownColumns.get();
+    }
+    if (image == nullptr || columns == nullptr) return;
     for (int32_t x = 0; x < W; ++x) columns[x] = SampleAt(x, tw, bw, scale);
 
     const float opacity = property->opacity;
@@ -98,7 +110,7 @@ void GxPattern::doPostProcessing(GxECore::ParamPostProcessing* p) {
         const unsigned char* lower = tile->pixels + size_t(row.next) * tileStride;
         const uint32_t fy = row.weight;
         const unsigned char* m = p->src->pixels + size_t(box.top + y) * p->src->width + size_t(box.left);
-        uint32_t* out = image.get() + size_t(y) * size_t(W);
+        uint32_t* out = image + size_t(y) * size_t(W);
         for (int32_t x = 0; x < W; ++x) {
             if (m[x] == 0) continue;
             const Sample& col = columns[x];
@@ -123,7 +135,7 @@ void GxPattern::doPostProcessing(GxECore::ParamPostProcessing* p) {
             out[x] = word;
         }
     }
-    GxBlender::drawBitmapBlend32(box.left, box.top, p->dst, image.get(), W, H, W, GxE_BLEND_DST_OVER);
+    GxBlender::drawBitmapBlend32(box.left, box.top, p->dst, image, W, H, W, GxE_BLEND_DST_OVER);
 }
 
 }  // namespace Glimmer
