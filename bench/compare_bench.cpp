@@ -23,6 +23,7 @@
 // glyph drawing, and whatever the effect layers still allocate.
 //
 //   compare_bench [--frames N] [--scene NAME] [--no-instructions] [--smoke]
+//   compare_bench --hash      one Glimmer frame a scene, a hash of its pixels
 
 #include <ass/ass.h>
 #include <sched.h>
@@ -312,8 +313,20 @@ int main(int argc, char** argv) {
             instructions = false;
         } else if (!std::strcmp(argv[i], "--smoke")) {
             smoke = true;
+        } else if (!std::strcmp(argv[i], "--hash")) {
+            // To check that a change of the engine leaves every byte as it was.
+            InstallSystemFontFamilies();
+            for (const Scene& s : kScenes) {
+                GlimmerScene g = MakeGlimmer(s);
+                const unsigned* pixels = GlimmerFrame(g);
+                uint64_t hash = 1469598103934665603ull;  // FNV-1a
+                for (size_t k = 0; pixels != nullptr && k < size_t(g.width) * g.height; ++k)
+                    hash = (hash ^ pixels[k]) * 1099511628211ull;
+                std::printf("%-5s %dx%d %016llx\n", s.name, g.width, g.height, (unsigned long long)hash);
+            }
+            return 0;
         } else {
-            std::fprintf(stderr, "usage: %s [--frames N] [--scene NAME] [--no-instructions] [--smoke]\n",
+            std::fprintf(stderr, "usage: %s [--frames N] [--scene NAME] [--no-instructions] [--smoke] | --hash\n",
                          argv[0]);
             return 2;
         }
