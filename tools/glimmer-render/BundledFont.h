@@ -6,8 +6,8 @@
 
 namespace Glimmer::RenderTool {
 
-// The key the font is known under; its "-Bold" gives the weight 700.
-inline constexpr const char* kBundledFontKey = "bundled/DejaVuSans-Bold.ttf";
+// The name the font is known by; its "-Bold" gives the weight 700.
+inline constexpr const char* kBundledFontName = "DejaVuSans-Bold.ttf";
 
 std::string_view BundledFont();
 

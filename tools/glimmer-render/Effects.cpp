@@ -1,15 +1,8 @@
-// The effect catalogue and how each entry reaches the effect stack.
+// The effect catalogue and the library effect each entry becomes.
 //
-// Every value goes to the stack's own operation for its kind, unclamped, so
-// the stack applies its clamps exactly as it does for a device caller (the
-// help text states them). Three conveniences sit on top, each because the
-// stack would otherwise ignore what a user obviously meant:
-// - a layer opacity also scales every stop of a colour ramp (the glow and
-//   gradient fills read only the stops' own opacities);
-// - bevel and emboss colours carry their opacity, and the layer opacity, in
-//   their alpha byte (those filters read only the alpha bytes);
-// - "highlight" is the colour of the slopes that face the light on a raised
-//   glyph, "shadow" that of the others, as the records name them.
+// Every value goes to the library as typed, unclamped, so the library applies
+// its clamps (the help text states them). Parameter names, defaults and
+// ranges are the library's own; a test keeps the defaults in step.
 
 #include "Effects.h"
 
@@ -21,16 +14,9 @@
 
 #include "Png.h"
 #include "Values.h"
-#include "effect/GxECoreBase.h"
-#include "effect/GxEffect.h"
-#include "foundation/GxBitmap.h"
-#include "text/GxTextObject.h"
 
 namespace Glimmer::RenderTool {
 namespace {
-
-// A pattern tile larger than this is surely a mistake (and a large copy per layer).
-constexpr int kMaxTileSide = 4096;
 
 constexpr const char* kAngleHelp = "degrees, any value (folded into 0..359)";
 constexpr const char* kOpacityHelp = "0..1 (clamped)";
@@ -41,7 +27,7 @@ std::vector<ParamSpec> ShadowParams() {
         {"angle", ParamType::kNumber, "120", kAngleHelp},
         {"distance", ParamType::kNumber, "5", kPercentHelp},
         {"size", ParamType::kNumber, "5", "blur radius in pixels, 0..100 (truncated and clamped)"},
-        {"color", ParamType::kColor, "#000000", "the colour's own alpha is ignored; use opacity"},
+        {"color", ParamType::kColor, "#000000", "its alpha multiplies the opacity"},
         {"opacity", ParamType::kNumber, "0.75", kOpacityHelp},
     };
 }
@@ -59,7 +45,7 @@ std::vector<ParamSpec> ReliefParams(bool emboss) {
     std::vector<ParamSpec> params;
     if (emboss) {
         params.push_back({"style", ParamType::kChoice, "plain", "two-sided lights the surroundings oppositely",
-                          {{"plain", 0}, {"two-sided", 3}}});
+                          {{"plain", 0}, {"two-sided", 1}}});
     } else {
         params.push_back({"style", ParamType::kChoice, "inner", "inside or outside the glyph edges",
                           {{"inner", 1}, {"outer", 0}}});
@@ -84,50 +70,50 @@ std::vector<ParamSpec> ReliefParams(bool emboss) {
 std::vector<EffectSpec> BuildCatalog() {
     const std::vector<ParamSpec> glow = GlowParams();
     std::vector<EffectSpec> catalog = {
-        {"outer-shadow", {"shadow", "drop-shadow"}, GxECore::kOuterShadow,
+        {"outer-shadow", {"shadow", "drop-shadow"}, EffectKind::kOuterShadow,
          "a blurred copy of the text behind it; angle 0 casts it to the left, 90 down",
          ShadowParams()},
-        {"inner-shadow", {}, GxECore::kInnerShadow,
-         "darkens the inside of the glyphs along the edges facing away from the light", ShadowParams()},
-        {"outer-glow", {"glow"}, GxECore::kOuterGlow, "a soft halo around the glyphs", glow},
-        {"inner-glow", {}, GxECore::kInnerGlow, "lights the glyphs from their edges inward", glow},
-        {"stroke", {"outline"}, GxECore::kStroke, "an outline along the glyph edges",
+        {"inner-shadow", {}, EffectKind::kInnerShadow,
+         "shades the inside of the glyphs along their edges; angle 0 the right ones, 90 the top ones", ShadowParams()},
+        {"outer-glow", {"glow"}, EffectKind::kOuterGlow, "a soft halo around the glyphs", glow},
+        {"inner-glow", {}, EffectKind::kInnerGlow, "lights the glyphs from their edges inward", glow},
+        {"stroke", {"outline"}, EffectKind::kStroke, "an outline along the glyph edges",
          {
              {"size", ParamType::kNumber, "3", "width in pixels, 0..100 (truncated and clamped)"},
-             {"color", ParamType::kColor, "#000000", "the colour's own alpha is ignored; use opacity"},
+             {"color", ParamType::kColor, "#000000", "its alpha multiplies the opacity"},
              {"opacity", ParamType::kNumber, "1", kOpacityHelp},
              {"position", ParamType::kChoice, "outside", "where the band lies against the edge",
               {{"outside", 1}, {"center", 0}, {"centre", 0}, {"inside", 2}}},
          }},
-        {"linear-gradient", {"gradient"}, GxECore::kLinearGradient, "fills the glyphs with a colour ramp",
+        {"linear-gradient", {"gradient"}, EffectKind::kLinearGradient, "fills the glyphs with a colour ramp",
          {
              {"angle", ParamType::kNumber, "90", "degrees (folded into 0..359); 0 runs from the first stop on the left, 90 from the bottom"},
              {"scale", ParamType::kNumber, "1", "length of the ramp against the text box, 0..2 (clamped); below 0.1 draws nothing"},
              {"opacity", ParamType::kNumber, "1", "0..1; scales every stop"},
              {"stops", ParamType::kStops, "#FFFFFF/#000000", "the colour ramp"},
          }},
-        {"radial-gradient", {"radial"}, GxECore::kRadialGradient,
+        {"radial-gradient", {"radial"}, EffectKind::kRadialGradient,
          "fills the glyphs with a ramp from the centre of the text box",
          {
              {"scale", ParamType::kNumber, "1", "radius against half the box width, 0..2 (clamped); below 0.1 draws nothing"},
              {"opacity", ParamType::kNumber, "1", "0..1; scales every stop"},
              {"stops", ParamType::kStops, "#FFFFFF/#000000", "the colour ramp, centre first"},
          }},
-        {"pattern", {}, GxECore::kPattern, "fills the glyphs with a repeated PNG tile",
+        {"pattern", {}, EffectKind::kPattern, "fills the glyphs with a repeated PNG tile",
          {
              {"tile", ParamType::kFile, "", "PNG file (required)"},
              {"scale", ParamType::kNumber, "1", "tile magnification, 0..10 (clamped); below 0.1 draws nothing"},
              {"opacity", ParamType::kNumber, "1", kOpacityHelp},
          }},
-        {"bevel", {}, GxECore::kBevel, "makes the glyphs look raised", ReliefParams(false)},
-        {"emboss", {}, GxECore::kEmboss, "makes the glyphs look pressed up out of the surface",
+        {"bevel", {}, EffectKind::kBevel, "makes the glyphs look raised", ReliefParams(false)},
+        {"emboss", {}, EffectKind::kEmboss, "makes the glyphs look pressed up out of the surface",
          ReliefParams(true)},
-        {"text", {"fill"}, GxECore::kText, "the glyphs themselves",
+        {"text", {"fill"}, EffectKind::kText, "the glyphs themselves",
          {
              {"color", ParamType::kColor, "#000000",
-              "the text colour; its alpha fades the whole picture, effects included"},
+              "the fill colour; its alpha fades the whole picture, effects included"},
              {"opacity", ParamType::kNumber, "1",
-              "0..1 (clamped); below 1 the layers are merged through a separate work image"},
+              "fill opacity 0..1 (clamped): fades the fill, not the effects (--exact: the engine's text opacity)"},
          }},
     };
     return catalog;
@@ -220,40 +206,28 @@ void CheckComplete(const EffectRequest& request) {
     }
 }
 
-float Unit(float value) { return std::clamp(value, 0.0f, 1.0f); }
-
-// Integer arguments of the stack from typed numbers, kept where a conversion is defined.
-int WholeNumber(float value) { return int(std::clamp(value, -1.0e6f, 1.0e6f)); }
-
-// Stops with the layer opacity folded into each one's own.
-std::vector<GxGradient> ScaledStops(std::vector<GxGradient> stops, float opacity) {
-    for (GxGradient& stop : stops) stop.opacity = Unit(stop.opacity) * Unit(opacity);
-    return stops;
+glimmer::Image LoadTile(const ParamValue& value) {
+    const Image tile =
+        value.image.pixels.empty() ? ReadPng(value.path, "pattern tile", glimmer::kMaxTileSide) : value.image;
+    return glimmer::Image{tile.width, tile.height, tile.pixels};
 }
 
-// A colour whose alpha byte carries the opacities the relief filters would not read.
-uint32_t WithAlpha(uint32_t color, float opacity) {
-    const float alpha = float(color >> 24) * Unit(opacity) + 0.5f;
-    return (color & 0x00FFFFFFu) | uint32_t(alpha) << 24;
-}
-
-GxBitmap* LoadTile(const ParamValue& value) {
-    const Image tile = value.image.pixels.empty() ? ReadPng(value.path, "pattern tile", kMaxTileSide) : value.image;
-    // The pattern layer reads bytes alpha, red, green, blue, straight colour.
-    std::vector<unsigned char> bytes(tile.pixels.size() * 4);
-    for (size_t i = 0; i < tile.pixels.size(); ++i) {
-        const uint32_t c = tile.pixels[i];
-        bytes[i * 4 + 0] = uint8_t(c >> 24);
-        bytes[i * 4 + 1] = uint8_t(c >> 16);
-        bytes[i * 4 + 2] = uint8_t(c >> 8);
-        bytes[i * 4 + 3] = uint8_t(c);
-    }
-    auto* bitmap = new GxBitmap(unsigned(tile.width), unsigned(tile.height), bytes.data(), 4);
-    if (bitmap->pixels == nullptr) {
-        delete bitmap;
-        throw RenderError("pattern tile: out of memory for " + Quote(value.path));
-    }
-    return bitmap;
+template <typename Relief>
+Relief MakeRelief(const EffectRequest& e) {
+    Relief r;
+    r.size = e.Get("size").number;
+    r.depth = e.Get("depth").number;
+    r.direction = e.Get("direction").choice == 1 ? glimmer::ReliefDirection::kUp : glimmer::ReliefDirection::kDown;
+    r.technique = e.Get("technique").choice == 1 ? glimmer::ReliefTechnique::kHard : glimmer::ReliefTechnique::kSmooth;
+    r.soften = int(std::clamp(e.Get("soften").number, -1.0e6f, 1.0e6f));
+    r.angle = e.Get("angle").number;
+    r.altitude = e.Get("altitude").number;
+    r.highlight = e.Get("highlight").color;
+    r.highlightOpacity = e.Get("highlight-opacity").number;
+    r.shadow = e.Get("shadow").color;
+    r.shadowOpacity = e.Get("shadow-opacity").number;
+    r.opacity = e.Get("opacity").number;
+    return r;
 }
 
 }  // namespace
@@ -354,82 +328,62 @@ EffectRequest ParseEffect(const nlohmann::json& object, const std::string& baseD
     return request;
 }
 
-void ApplyEffect(const EffectRequest& effect, GxTextObject* text) {
-    GxEffect* stack = text->GetEffect();
-    if (stack == nullptr) throw RenderError("the text object has no effect stack");
-    const EffectRequest& e = effect;
+void AddEffect(const EffectRequest& e, glimmer::Text* text) {
     auto number = [&](const char* name) { return e.Get(name).number; };
     auto color = [&](const char* name) { return e.Get(name).color; };
     auto choice = [&](const char* name) { return e.Get(name).choice; };
-
-    int id = 0;
     switch (e.spec->kind) {
-        case GxECore::kOuterShadow:
-            id = stack->addOuterShadowText(number("angle"), number("distance"), number("size"), color("color"),
-                                           number("opacity"));
-            break;
-        case GxECore::kInnerShadow:
-            id = stack->addInnerShadowText(number("angle"), number("distance"), number("size"), color("color"),
-                                           number("opacity"));
-            break;
-        case GxECore::kOuterGlow:
-        case GxECore::kInnerGlow: {
-            const std::vector<GxGradient> stops = ScaledStops(e.Get("stops").stops, number("opacity"));
-            const GxGradient* ramp = stops.empty() ? nullptr : stops.data();
-            id = e.spec->kind == GxECore::kOuterGlow
-                     ? stack->addOuterGlowText(number("size"), color("color"), number("opacity"),
-                                               int(stops.size()), ramp)
-                     : stack->addInnerGlowText(number("size"), color("color"), number("opacity"),
-                                               int(stops.size()), ramp);
-            break;
-        }
-        case GxECore::kStroke:
-            // The fourth integer is carried into the key and read by nothing; 0 as the bridge's callers pass.
-            id = stack->addStrokeText(number("size"), color("color"), number("opacity"), 0, choice("position"));
-            break;
-        case GxECore::kLinearGradient: {
-            const std::vector<GxGradient> stops = ScaledStops(e.Get("stops").stops, number("opacity"));
-            id = stack->addLinearGradientText(number("angle"), number("scale"), number("opacity"),
-                                              int(stops.size()), stops.empty() ? nullptr : stops.data());
-            break;
-        }
-        case GxECore::kRadialGradient: {
-            const std::vector<GxGradient> stops = ScaledStops(e.Get("stops").stops, number("opacity"));
-            id = stack->addRadialGradientText(number("scale"), number("opacity"), int(stops.size()),
-                                              stops.empty() ? nullptr : stops.data());
-            break;
-        }
-        case GxECore::kPattern: {
-            std::unique_ptr<GxBitmap> tile(LoadTile(e.Get("tile")));
-            id = stack->addPatternText(tile.get(), number("scale"), number("opacity"));
-            break;
-        }
-        case GxECore::kBevel:
-        case GxECore::kEmboss: {
-            const float layer = number("opacity");
-            const uint32_t highlight = WithAlpha(color("highlight"), number("highlight-opacity") * Unit(layer));
-            const uint32_t shadow = WithAlpha(color("shadow"), number("shadow-opacity") * Unit(layer));
-            if (e.spec->kind == GxECore::kBevel) {
-                id = stack->addBevelText(choice("style"), number("depth"), number("size"), choice("direction"),
-                                         choice("technique"), WholeNumber(number("soften")), layer,
-                                         number("angle"), number("altitude"), highlight, number("highlight-opacity"),
-                                         shadow, number("shadow-opacity"));
-            } else {
-                id = stack->addEmbossText(choice("style"), number("depth"), number("size"), choice("direction"),
-                                          choice("technique"), WholeNumber(number("soften")), layer,
-                                          number("angle"), number("altitude"), highlight, number("highlight-opacity"),
-                                          shadow, number("shadow-opacity"));
-            }
-            break;
-        }
-        case GxECore::kText:
-            text->SetTextColor(color("color"));
-            stack->setTextOpacity(number("opacity"));
+        case EffectKind::kOuterShadow:
+            text->effects.push_back(glimmer::OuterShadow{number("angle"), number("distance"), number("size"),
+                                                         color("color"), number("opacity")});
             return;
-        default:
-            break;
+        case EffectKind::kInnerShadow:
+            text->effects.push_back(glimmer::InnerShadow{number("angle"), number("distance"), number("size"),
+                                                         color("color"), number("opacity")});
+            return;
+        case EffectKind::kOuterGlow:
+            text->effects.push_back(
+                glimmer::OuterGlow{number("size"), color("color"), number("opacity"), e.Get("stops").stops});
+            return;
+        case EffectKind::kInnerGlow:
+            text->effects.push_back(
+                glimmer::InnerGlow{number("size"), color("color"), number("opacity"), e.Get("stops").stops});
+            return;
+        case EffectKind::kStroke: {
+            const int position = choice("position");
+            text->effects.push_back(glimmer::Stroke{number("size"), color("color"), number("opacity"),
+                                                    position == 0   ? glimmer::StrokePosition::kCenter
+                                                    : position == 2 ? glimmer::StrokePosition::kInside
+                                                                    : glimmer::StrokePosition::kOutside});
+            return;
+        }
+        case EffectKind::kLinearGradient:
+            text->effects.push_back(
+                glimmer::LinearGradient{number("angle"), number("scale"), number("opacity"), e.Get("stops").stops});
+            return;
+        case EffectKind::kRadialGradient:
+            text->effects.push_back(glimmer::RadialGradient{number("scale"), number("opacity"), e.Get("stops").stops});
+            return;
+        case EffectKind::kPattern:
+            text->effects.push_back(glimmer::Pattern{LoadTile(e.Get("tile")), number("scale"), number("opacity")});
+            return;
+        case EffectKind::kBevel: {
+            glimmer::Bevel bevel = MakeRelief<glimmer::Bevel>(e);
+            bevel.style = choice("style") == 0 ? glimmer::BevelStyle::kOuter : glimmer::BevelStyle::kInner;
+            text->effects.push_back(bevel);
+            return;
+        }
+        case EffectKind::kEmboss: {
+            glimmer::Emboss emboss = MakeRelief<glimmer::Emboss>(e);
+            emboss.style = choice("style") == 1 ? glimmer::EmbossStyle::kTwoSided : glimmer::EmbossStyle::kPlain;
+            text->effects.push_back(emboss);
+            return;
+        }
+        case EffectKind::kText:
+            text->style.color = color("color");
+            text->style.fillOpacity = number("opacity");
+            return;
     }
-    if (id < 0) throw RenderError(std::string("the effect stack refused the ") + e.spec->name + " effect");
 }
 
 std::string EffectHelp() {

@@ -3,7 +3,7 @@
 // stack, with the parameter names people expect, their defaults and ranges.
 // The catalogue drives everything: parsing "KIND:name=value,..." from the
 // command line and {"type": KIND, name: value} from JSON, the help text, and
-// the call on the effect stack that adds the layer.
+// the library effect each entry becomes.
 
 #include <cstdint>
 #include <string>
@@ -13,13 +13,24 @@
 #include <nlohmann/json_fwd.hpp>
 
 #include "Png.h"
-#include "effect/GxProperty.h"
-
-namespace Glimmer {
-class GxTextObject;
-}
+#include "glimmer/glimmer.h"
 
 namespace Glimmer::RenderTool {
+
+// One per effect type of the library, and the text fill.
+enum class EffectKind {
+    kOuterShadow,
+    kInnerShadow,
+    kOuterGlow,
+    kInnerGlow,
+    kStroke,
+    kLinearGradient,
+    kRadialGradient,
+    kPattern,
+    kBevel,
+    kEmboss,
+    kText,
+};
 
 enum class ParamType { kNumber, kColor, kChoice, kStops, kFile };
 
@@ -39,7 +50,7 @@ struct ParamSpec {
 struct EffectSpec {
     const char* name;
     std::vector<const char*> aliases;
-    int kind;                   // the stack's layer kind
+    EffectKind kind;
     const char* summary;
     std::vector<ParamSpec> params;
 };
@@ -54,7 +65,7 @@ struct ParamValue {
     float number = 0.0f;
     uint32_t color = 0;
     int choice = 0;
-    std::vector<GxGradient> stops;
+    std::vector<glimmer::ColorStop> stops;
     std::string path;
     Image image;   // a file's content given directly (non-empty: used instead of path)
 };
@@ -72,10 +83,9 @@ EffectRequest ParseEffect(std::string_view text);
 // `baseDir`.
 EffectRequest ParseEffect(const nlohmann::json& object, const std::string& baseDir);
 
-// Adds the effect to the text object's stack through the stack's own
-// operation for its kind (so its clamps apply). The text kind sets the text
-// colour and the stack's text opacity instead.
-void ApplyEffect(const EffectRequest& effect, GxTextObject* text);
+// Adds the effect to the text; the text kind sets the fill colour and
+// opacity instead. RenderError when a tile file cannot be read.
+void AddEffect(const EffectRequest& effect, glimmer::Text* text);
 
 // The effects section of --help.
 std::string EffectHelp();

@@ -63,15 +63,13 @@ const std::vector<GalleryCell>& GalleryCells() {
         {"text", {"text:color=#2B3A55"}},
         {"stroke, outside", {"text:color=#FFFFFF", "stroke:size=4,color=#D7263D,position=outside"}},
         {"stroke, center", {"text:color=#FFD23F", "stroke:size=4,color=#1B1B3A,position=center"}},
-        {"stroke, inside (text opacity 0.99)",
-         {"text:color=#A3D5FF,opacity=0.99", "stroke:size=4,color=#1D5C8C,position=inside"}},
+        {"stroke, inside", {"text:color=#A3D5FF", "stroke:size=4,color=#1D5C8C,position=inside"}},
         {"outer shadow", {"text:color=#2B3A55", "outer-shadow:angle=120,distance=6,size=6,opacity=0.6"}},
         {"inner shadow", {"text:color=#F4A259", "inner-shadow:angle=120,distance=4,size=4,opacity=0.8"}},
         {"outer glow", {"text:color=#5B2A86", "outer-glow:size=14,color=#FF3CAC,opacity=1"}},
         {"outer glow, colour ramp",
          {"text:color=#222222", "outer-glow:size=16,opacity=1,stops=#FFE600/#FF3C00/#8000FF"}},
-        {"inner glow (text opacity 0.99)",
-         {"text:color=#1F4E79,opacity=0.99", "inner-glow:size=5,color=#FFE14D,opacity=1"}},
+        {"inner glow", {"text:color=#1F4E79", "inner-glow:size=5,color=#FFE14D,opacity=1"}},
         {"linear gradient", {"linear-gradient:angle=90,stops=#12C2E9/#C471ED/#F64F59"}},
         {"radial gradient", {"radial-gradient:scale=1,stops=#FFF176/#FF7043/#6A1B9A"}},
         {"pattern", {std::string("pattern:scale=1,tile=") + kDrawnTile}},
@@ -80,7 +78,7 @@ const std::vector<GalleryCell>& GalleryCells() {
         {"emboss", {"text:color=#C9A227", "emboss:size=6,depth=3"}},
         {"emboss, two-sided", {"text:color=#C9A227", "emboss:style=two-sided,size=6,depth=3"}},
         {"neon: stroke + glows",
-         {"text:color=#FFFFFF,opacity=0.99", "stroke:size=2,color=#00B8D4", "inner-glow:size=4,color=#00E5FF,opacity=1",
+         {"text:color=#FFFFFF", "stroke:size=2,color=#00B8D4", "inner-glow:size=4,color=#00E5FF,opacity=1",
           "outer-glow:size=14,color=#00E5FF,opacity=1"}},
         {"gradient + stroke + shadow",
          {"linear-gradient:stops=#FFD200/#F7971E", "stroke:size=3,color=#5A2D0C",
@@ -129,7 +127,7 @@ Image RenderGallery(const std::string& sampleText, const std::string& fontPath) 
     const int width = std::max(kColumns * cardWidth + (kColumns + 1) * kGap, title.width + 2 * kGap);
     const int top = kGap + title.height + kGap / 2;
     const int height = top + rows * (cardHeight + kGap);
-    if (int64_t(width) * height > Limits::kMaxPixels || width > Limits::kMaxSide || height > Limits::kMaxSide) {
+    if (int64_t(width) * height > glimmer::kMaxPixels || width > glimmer::kMaxSide || height > glimmer::kMaxSide) {
         throw RenderError("the gallery would be " + std::to_string(width) + "x" + std::to_string(height) +
                           " pixels; use a shorter sample text or a smaller font");
     }

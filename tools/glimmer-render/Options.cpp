@@ -39,7 +39,7 @@ std::string Unescape(const std::string& text) {
 
 int Side(const std::string& value, const char* what) {
     const int side = ParseInteger(value, what);
-    if (side < 0 || side > Limits::kMaxSide) throw UsageError(std::string(what) + " must lie in 0..32767");
+    if (side < 0 || side > glimmer::kMaxSide) throw UsageError(std::string(what) + " must lie in 0..32767");
     return side;
 }
 
@@ -86,7 +86,7 @@ std::vector<Option> BuildOptions() {
         {"size", 's', "PX", "72", "text size in pixels per em, 1..2048",
          [](Command& c, const std::string& v, const Source&) {
              c.request.size = ParseNumber(v, "--size");
-             if (!(c.request.size >= 1.0f && c.request.size <= Limits::kMaxTextSize)) {
+             if (!(c.request.size >= 1.0f && c.request.size <= glimmer::kMaxTextSize)) {
                  throw UsageError("--size must lie in 1..2048 pixels");
              }
          }},
@@ -125,18 +125,20 @@ std::vector<Option> BuildOptions() {
                  {"right", int(Align::kRight)}};
              c.request.align = Align(Pick(v, "--align", choices));
          }},
-        {"gravity", 0, "top|center|bottom|fill", "top", "vertical gravity of the lines in the view",
+        {"gravity", 0, "top|center|bottom", "top", "vertical gravity of the lines in the view",
          [](Command& c, const std::string& v, const Source&) {
-             static const std::pair<const char*, int> choices[] = {
-                 {"top", 0x30}, {"center", 0x10}, {"centre", 0x10}, {"bottom", 0x50}, {"fill", 0x70}};
-             c.request.verticalGravity = Pick(v, "--gravity", choices);
+             static const std::pair<const char*, int> choices[] = {{"top", int(Gravity::kTop)},
+                                                                   {"center", int(Gravity::kCenter)},
+                                                                   {"centre", int(Gravity::kCenter)},
+                                                                   {"bottom", int(Gravity::kBottom)}};
+             c.request.gravity = Gravity(Pick(v, "--gravity", choices));
          }},
         {"wrap", 0, "PX", "the view width if given, else none", "wrap lines at this width; 0 never wraps",
          [](Command& c, const std::string& v, const Source&) { c.request.wrap = float(Side(v, "--wrap")); }},
-        {"max-lines", 0, "N", "unlimited", "the view's maximum line count; 0 shows no line",
+        {"first-line", 0, "N", "0", "the first line shown, counted from 0",
+         [](Command& c, const std::string& v, const Source&) { c.request.firstLine = Count(v, "--first-line"); }},
+        {"max-lines", 0, "N", "0 (all)", "show at most this many lines",
          [](Command& c, const std::string& v, const Source&) { c.request.maxLines = Count(v, "--max-lines"); }},
-        {"line-limit", 0, "N", "0 (off)", "lines to show, before --max-lines; bottom gravity shows the last ones",
-         [](Command& c, const std::string& v, const Source&) { c.request.lineLimit = Count(v, "--line-limit"); }},
         {"background", 0, "COLOR", "none", "background colour of the line boxes",
          [](Command& c, const std::string& v, const Source&) {
              c.request.background = ParseColor(v, "--background");
@@ -170,6 +172,9 @@ std::vector<Option> BuildOptions() {
          [](Command& c, const std::string& v, const Source&) { c.request.features = v; }},
         {"locale", 0, "TAGS", "none", "locale list of the paint, e.g. ja or zh-Hant",
          [](Command& c, const std::string& v, const Source&) { c.request.locale = v; }},
+        {"exact", 0, nullptr, "off",
+         "the engine's literal behaviour: effects stack in the order given, inner effects may paint the line box",
+         [](Command& c, const std::string& v, const Source&) { c.request.exact = ParseBoolean(v, "--exact"); }},
         {"gallery", 0, nullptr, "off", "render the contact sheet of every effect instead",
          [](Command& c, const std::string& v, const Source&) {
              if (ParseBoolean(v, "--gallery")) c.mode = Command::Mode::kGallery;
@@ -372,8 +377,13 @@ std::string HelpText() {
         "Values:\n"
         "  colours   #RRGGBB, #AARRGGBB (alpha first), #RGB, 0xAARRGGBB or a name: " + ColorNames() + "\n"
         "  stops     COLOR[@POSITION[@OPACITY]] separated by '/', e.g. #FFE600@0/#FF3C00@0.5/#8000FF@1;\n"
-        "            positions 0..1 for all stops or none (then evenly spread); opacity from the colour's alpha\n"
-        "  An effect kind given twice keeps one layer with the last parameters, as the effect stack does.\n"
+        "            positions 0..1 for all stops or none (then evenly spread); an opacity multiplies the colour's alpha\n"
+        "  An effect kind given twice is drawn once, with the last parameters.\n"
+        "\n"
+        "Stacking: effects stack in one order whatever the order given, bottom to top: outer shadow, outer\n"
+        "glow, stroke (outside or center), outer bevel, emboss outside the glyphs; the fill, pattern, radial\n"
+        "and linear gradient, inner glow, inner shadow, stroke (inside), bevel, emboss inside them. Inner\n"
+        "effects stay inside the glyphs. --exact stacks by the order given, as the engine itself does.\n"
         "\n"
         "JSON (--effects FILE): an array of effects, or an object with \"effects\" and any option by its\n"
         "long name; relative file names are taken from the JSON file's folder:\n"

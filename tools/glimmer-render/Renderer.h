@@ -1,33 +1,19 @@
 #pragma once
-// One render of one text: a GxTextObject filled the way the Java bridge fills
-// it (font, paint, view, line limit, text and line records, effects), its
-// bitmap sized to the view plus the effect margins, and its pixels returned.
+// One render of one text: the request the command line or a JSON file makes,
+// turned into a library text and rendered by the library.
 
-#include <climits>
 #include <cstdint>
 #include <string>
 #include <vector>
 
 #include "Effects.h"
-#include "LineLayout.h"
 #include "Png.h"
-#include "text/GxLineInfo.h"
+#include "glimmer/glimmer.h"
 
 namespace Glimmer::RenderTool {
 
-// Limits of what the renderer agrees to do, each with its reason.
-struct Limits {
-    // Text size: larger glyphs only make larger images; this keeps a typo
-    // from asking for gigabytes.
-    static constexpr float kMaxTextSize = 2048.0f;
-    // Image side: PNG and the line masks are comfortable below this.
-    static constexpr int kMaxSide = 32767;
-    // Image area: every render holds several images of this size at once
-    // (mask, work image, effect picture, result).
-    static constexpr int64_t kMaxPixels = int64_t(1) << 26;
-    // Text: lines are measured from their start per break opportunity.
-    static constexpr size_t kMaxTextLength = 100000;
-};
+using glimmer::Align;
+using glimmer::Gravity;
 
 struct RenderRequest {
     std::string text = "Glimmer";
@@ -48,12 +34,13 @@ struct RenderRequest {
     int height = 0;
     int padding[4] = {0, 0, 0, 0};   // left, top, right, bottom
     Align align = Align::kLeft;
-    int verticalGravity = 0x30;
+    Gravity gravity = Gravity::kTop;
     float wrap = -1.0f;            // < 0: at the view width when one is given; 0: never
-    int maxLines = INT_MAX;        // a TextView without a limit reports INT_MAX
-    int lineLimit = 0;             // the bridge's line limit; 0: none
-    bool hasBackground = false;    // a background colour span over the text
+    int firstLine = 0;             // the lines shown: from this one,
+    int maxLines = 0;              // at most this many (0: all)
+    bool hasBackground = false;    // a background colour behind each line
     uint32_t background = 0;
+    bool exact = false;            // the engine's literal stacking instead of layer style
     std::vector<EffectRequest> effects;
 };
 
@@ -61,13 +48,12 @@ struct RenderResult {
     Image image;                   // 0xAARRGGBB, straight alpha
     int viewWidth = 0;
     int viewHeight = 0;
-    int left = 0;                  // the effect stack's margins
+    int left = 0;                  // the effect margins
     int top = 0;
     int right = 0;
     int bottom = 0;
     std::string key;               // printable appearance key
-    std::vector<LayoutLine> layout;
-    std::vector<GxLineInfo> lines; // the records handed over
+    std::vector<glimmer::Line> lines;
 };
 
 // UsageError for a malformed request, RenderError for one that cannot be

@@ -41,7 +41,7 @@ int HexDigit(char c) {
 }
 
 // One stop of a ramp; `hasPosition` tells whether a position was given.
-GxGradient ParseStop(std::string_view text, std::string_view what, bool* hasPosition) {
+glimmer::ColorStop ParseStop(std::string_view text, std::string_view what, bool* hasPosition) {
     const std::string_view t = Trim(text);
     std::vector<std::string_view> parts;
     size_t from = 0;
@@ -55,9 +55,8 @@ GxGradient ParseStop(std::string_view text, std::string_view what, bool* hasPosi
         throw UsageError(std::string(what) + ": stop " + Quote(t) + " has more than COLOR@POSITION@OPACITY");
     }
     const std::string label = std::string(what) + " stop " + Quote(t);
-    GxGradient stop;
+    glimmer::ColorStop stop;
     stop.color = ParseColor(parts[0], label);
-    stop.opacity = float(stop.color >> 24) / 255.0f;
     stop.position = -1.0f;
     *hasPosition = parts.size() >= 2;
     if (parts.size() >= 2) {
@@ -158,8 +157,8 @@ std::string ColorNames() {
 }
 
 
-std::vector<GxGradient> ParseStops(std::string_view text, std::string_view what) {
-    std::vector<GxGradient> stops;
+std::vector<glimmer::ColorStop> ParseStops(std::string_view text, std::string_view what) {
+    std::vector<glimmer::ColorStop> stops;
     std::vector<bool> positioned;
     size_t from = 0;
     while (from <= text.size()) {
@@ -189,22 +188,6 @@ std::vector<GxGradient> ParseStops(std::string_view text, std::string_view what)
         }
     }
     return stops;
-}
-
-std::string PrintableKey(const char* key) {
-    std::string out;
-    if (key == nullptr) return out;
-    char hex[3];
-    for (const unsigned char* p = reinterpret_cast<const unsigned char*>(key); *p != 0; ++p) {
-        if (*p < 0x80) {
-            if (!out.empty()) out += ' ';
-            out += char(*p);
-        } else {
-            std::snprintf(hex, sizeof hex, "%02X", unsigned(*p));
-            out += hex;
-        }
-    }
-    return out;
 }
 
 std::vector<char> ReadFileBytes(const std::string& path, std::string_view what) {

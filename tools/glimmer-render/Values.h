@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-#include "effect/GxProperty.h"
+#include "glimmer/glimmer.h"
 
 namespace Glimmer::RenderTool {
 
@@ -44,14 +44,9 @@ std::string FormatColor(uint32_t color);
 std::string ColorNames();
 
 // A colour ramp: stops "COLOR[@POSITION[@OPACITY]]" separated by '/' or
-// spaces. A stop's opacity defaults to its colour's alpha; positions (0..1)
+// spaces. A stop's opacity multiplies its colour's alpha; positions (0..1)
 // are given for every stop or for none, and then spread evenly.
-std::vector<GxGradient> ParseStops(std::string_view text, std::string_view what);
-
-// The appearance key in a form fit for a terminal: every record's letter
-// followed by its bytes in hex, records separated by spaces
-// ("T8F8F838386868989").
-std::string PrintableKey(const char* key);
+std::vector<glimmer::ColorStop> ParseStops(std::string_view text, std::string_view what);
 
 // Reads a whole file; a RenderError naming `what` when it cannot.
 std::vector<char> ReadFileBytes(const std::string& path, std::string_view what);

@@ -13,6 +13,7 @@
 #include "Png.h"
 #include "Renderer.h"
 #include "Values.h"
+#include "glimmer/glimmer.h"
 
 namespace {
 
@@ -25,7 +26,7 @@ int Run(const std::vector<std::string>& args) {
             std::fputs(HelpText().c_str(), stdout);
             return 0;
         case Command::Mode::kVersion:
-            std::printf("glimmer-render %s\n", GLIMMER_VERSION);
+            std::printf("glimmer-render %s\n", glimmer::versionString());
             return 0;
         case Command::Mode::kGallery: {
             const std::string output = command.output.empty() ? "gallery.png" : command.output;
