@@ -12,7 +12,8 @@
 // Line layout is done here, not by a platform: lines are measured with the
 // same paint, families and shaping the glyph drawing uses, so a line never
 // comes out wider than it was measured. A view without a size gets the size of
-// the lines shown, as a wrap_content TextView would.
+// the lines shown, as a wrap_content TextView would, widened on the right when
+// slanted or emboldened ink reaches past a line's advance.
 //
 // Layer style (the default) switches the stack to its work-image mode and adds
 // the effects in the canonical order; the exact mode adds them as given and
@@ -113,8 +114,19 @@ public:
         typeface_ = Glimmer::Platform::CreateTypefaceFromFamilies(families, weight, text->isItalicTextStyle());
     }
 
-    float operator()(size_t start, size_t end) const {
-        if (typeface_ == nullptr || end <= start) return 0.0f;
+    float operator()(size_t start, size_t end) const { return LayOut(start, end).advance; }
+
+    // How far the line's mask reaches from its pen: its ink box's width,
+    // which a slant or fake bold can make larger than the advance.
+    float InkWidth(size_t start, size_t end) const {
+        const Glimmer::Platform::Layout layout = LayOut(start, end);
+        return layout.bounds.IsEmpty() ? 0.0f : layout.bounds.right - layout.bounds.left;
+    }
+
+private:
+    Glimmer::Platform::Layout LayOut(size_t start, size_t end) const {
+        Glimmer::Platform::Layout layout;
+        if (typeface_ == nullptr || end <= start) return layout;
         size_t contextStart = 0;
         for (size_t at = start; at >= 1; --at) {
             if (at < utf16_.size() && (utf16_[at] == 10 || utf16_[at] == 13)) {
@@ -123,13 +135,11 @@ public:
             }
         }
         const auto* units = reinterpret_cast<const uint16_t*>(utf16_.data());
-        Glimmer::Platform::Layout layout;
         Glimmer::Platform::LayoutText(paint_, Glimmer::Platform::Bidi::kDefaultLtr, *typeface_, units, utf16_.size(),
                                       start, end - start, contextStart, end - contextStart, &layout);
-        return layout.advance;
+        return layout;
     }
 
-private:
     const std::u16string& utf16_;
     Glimmer::Platform::Paint paint_;
     std::shared_ptr<Glimmer::Platform::Typeface> typeface_;
@@ -219,6 +229,18 @@ Result<Picture> RenderLocked(const Text& request, const RenderOptions& options, 
     view.first = int(first);
     view.count = int(shown);
     view.width = layout.width > 0 ? layout.width : layoutWidth + layout.padding.left + layout.padding.right;
+    if (layout.width <= 0) {
+        // A view that fits the text also fits ink that leans or swells past
+        // the advance, so that nothing is cut at its right edge.
+        double inkRight = 0.0;
+        for (size_t i = first; i < first + shown; ++i) {
+            const LayoutLine& line = lines[i];
+            if (line.visibleEnd <= line.start) continue;
+            const float ink = measure.InkWidth(size_t(line.start), size_t(line.visibleEnd));
+            if (ink > line.width) inkRight = std::max(inkRight, double(line.left) + std::ceil(double(ink)) + 1.0);
+        }
+        if (inkRight > double(layoutWidth)) view.width += ClampSide(std::ceil(inkRight)) - layoutWidth;
+    }
     view.height = layout.height > 0 ? layout.height
                                     : lines[first + shown - 1].bottom - lines[first].top + layout.padding.top +
                                           layout.padding.bottom;

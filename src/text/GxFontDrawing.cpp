@@ -8,9 +8,13 @@
 //    from the last line break before it (CR or LF at an index of 1 or more)
 //    as context, right to left by default when the record's direction is
 //    negative and left to right otherwise;
-//  - its mask is exactly the line's advance wide and its ink bounds high,
-//    both truncated, with the baseline `top` rows down; the glyphs are drawn
-//    so that the bounds' top-left corner falls on the mask's (0, 0);
+//  - its mask is the line's advance wide and its ink bounds high, both
+//    truncated, with the baseline `top` rows down; the glyphs are drawn so
+//    that the bounds' top-left corner falls on the mask's (0, 0). Ink that
+//    reaches past that box (a slant or fake bold carries the last glyph past
+//    the advance; a fractional offset carries a mark below the last row)
+//    widens or deepens the mask just enough to keep it, so a line whose ink
+//    fits keeps exactly the box it always had;
 //  - the mask goes to the effect stack with its left edge at the record's x
 //    and its baseline at the record's baseline, both moved by the effects'
 //    left and top margins;
@@ -21,8 +25,9 @@
 // Post-processing and compositing run after the last line, also when there
 // were no lines.
 //
-// A record whose range does not lie inside the text lays out as nothing: a
-// zero-sized mask, still handed to the stack. Masks are capped at 65535
+// A record whose range does not lie inside the text (the text object refuses
+// to render such records; a direct caller may still pass one) lays out as
+// nothing: a zero-sized mask, still handed to the stack. Masks are capped at 65535
 // pixels a side and at the largest block a bitmap may have.
 
 #include "text/GxFontDrawing.h"
@@ -30,6 +35,7 @@
 #include <algorithm>
 #include <climits>
 #include <cmath>
+#include <cstring>
 #include <new>
 #include <vector>
 
@@ -79,6 +85,40 @@ GxGlyph* NewLineMask(int width, int height, int top) {
     glyph->top = top;
     glyph->left = 0;
     return glyph;
+}
+
+// Pixels the ink of a box `extent` pixels across may reach when drawn from a
+// fractional origin: whole-pixel origins round each glyph by up to half a
+// pixel, sub-pixel ones spill into the next pixel. One more for rounding.
+int InkReach(float extent) {
+    if (!(extent > 0.0f)) return 0;
+    if (extent >= float(kMaxMaskSide)) return kMaxMaskSide;
+    return std::min(kMaxMaskSide, int(std::ceil(extent)) + 1);
+}
+
+// Narrows a mask drawn with room to spare to its line box (boxWidth x
+// boxHeight) plus the columns and rows that hold ink, repacking the rows.
+void TrimToInk(GxGlyph* glyph, int boxWidth, int boxHeight) {
+    const int width = glyph->width, height = glyph->height;
+    if (glyph->buffer == nullptr || (width <= boxWidth && height <= boxHeight)) return;
+    int inkWidth = std::min(boxWidth, width), inkHeight = std::min(boxHeight, height);
+    for (int y = 0; y < height; ++y) {
+        const unsigned char* row = glyph->buffer + size_t(y) * size_t(width);
+        int last = width - 1;
+        while (last >= inkWidth && row[last] == 0) --last;
+        inkWidth = std::max(inkWidth, last + 1);
+        if (y >= inkHeight && std::any_of(row, row + width, [](unsigned char c) { return c != 0; })) {
+            inkHeight = y + 1;
+        }
+    }
+    if (inkWidth < width) {
+        for (int y = 1; y < inkHeight; ++y) {
+            std::memmove(glyph->buffer + size_t(y) * size_t(inkWidth), glyph->buffer + size_t(y) * size_t(width),
+                         size_t(inkWidth));
+        }
+    }
+    glyph->width = uint16_t(inkWidth);
+    glyph->height = uint16_t(inkHeight);
 }
 
 }  // namespace
@@ -217,8 +257,15 @@ void GxFontDrawing::DrawTextEffect(GxTextObject* text, GxBitmap* dst) {
         }
 
         const Platform::LayoutRect& bounds = layout.bounds;
-        GxGlyph* glyph = NewLineMask(MaskSide(layout.advance), MaskSide(bounds.bottom - bounds.top),
+        const int boxWidth = MaskSide(layout.advance);
+        const int boxHeight = MaskSide(bounds.bottom - bounds.top);
+        GxGlyph* glyph = NewLineMask(std::max(boxWidth, InkReach(bounds.right - bounds.left)),
+                                     std::max(boxHeight, InkReach(bounds.bottom - bounds.top)),
                                      Truncate(-bounds.top));
+        if (glyph != nullptr && glyph->buffer == nullptr && int64_t(boxWidth) * boxHeight > 0) {
+            delete glyph;   // no room to spare: the line box alone, as before
+            glyph = NewLineMask(boxWidth, boxHeight, Truncate(-bounds.top));
+        }
         if (glyph == nullptr) continue;
         const float box[4] = {bounds.left, bounds.top, bounds.right, bounds.bottom};
         DrawTextFunctor draw(&layout, glyph, box);
@@ -226,6 +273,7 @@ void GxFontDrawing::DrawTextEffect(GxTextObject* text, GxBitmap* dst) {
                                  [&](size_t start, size_t end, const Platform::RunFont& font) {
                                      draw(start, end, font);
                                  });
+        TrimToInk(glyph, boxWidth, boxHeight);
 
         if (glyphList == nullptr || !glyphList->Add(glyph)) {
             delete[] glyph->buffer;

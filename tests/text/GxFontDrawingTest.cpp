@@ -1,11 +1,15 @@
 #include <gtest/gtest.h>
 
+#include <memory>
+#include <numeric>
 #include <utility>
 #include <vector>
 
 #include "effect/GxEffect.h"
+#include "font/FontManager.h"
 #include "foundation/GxString.h"
 #include "foundation/List.h"
+#include "platform/TextLayout.h"
 #include "text/GxFontDrawing.h"
 #include "text/GxLineInfo.h"
 #include "text/GxTextObject.h"
@@ -146,6 +150,72 @@ TEST_F(LineMaskTest, SpacesAndBadRangesGiveEmptyMasks) {
         ASSERT_NE(mask, nullptr);
         EXPECT_EQ(mask->width, 0);
         EXPECT_EQ(mask->height, 0);
+    }
+}
+
+// Text[start, end) laid out as the drawing pass does, and all of its ink:
+// the coverage drawn with room on every side.
+struct LineInk {
+    float advance;
+    long coverage;
+};
+
+LineInk InkOf(GxTextObject& text, int start, int end) {
+    Platform::FontFamilies families;
+    int weight = 400;
+    FontManager::GetInstance()->GetMinikinFontFamilies(families, text.GetFont()->GetFontPath(), &weight);
+    auto typeface = Platform::CreateTypefaceFromFamilies(families, weight, text.isItalicTextStyle());
+    std::unique_ptr<uint16_t[]> units(text.GetText()->GetUTF16());
+    const Platform::Paint paint = text.GetPaint();
+    Platform::Layout layout;
+    Platform::LayoutText(paint, Platform::Bidi::kDefaultLtr, *typeface, units.get(),
+                         size_t(text.GetText()->GetUTF16Size() - 1), size_t(start), size_t(end - start), 0,
+                         size_t(end), &layout);
+    constexpr int kRoom = 64;
+    const int width = int(layout.bounds.right - layout.bounds.left) + 2 * kRoom;
+    const int height = int(layout.bounds.bottom - layout.bounds.top) + 2 * kRoom;
+    std::vector<uint8_t> mask(size_t(width) * size_t(height));
+    Platform::ForEachFontRun(layout, paint, [&](size_t first, size_t last, const Platform::RunFont& font) {
+        std::vector<uint16_t> ids;
+        std::vector<float> positions;
+        for (size_t i = first; i < last; ++i) {
+            ids.push_back(uint16_t(layout.glyphs[i].glyphId));
+            positions.push_back(layout.glyphs[i].x);
+            positions.push_back(layout.glyphs[i].y);
+        }
+        Platform::DrawGlyphs(font, ids.data(), positions.data(), ids.size(), kRoom - layout.bounds.left,
+                             kRoom - layout.bounds.top, mask.data(), width, height);
+    });
+    return {layout.advance, std::accumulate(mask.begin(), mask.end(), 0L)};
+}
+
+TEST_F(LineMaskTest, SlantedEmboldenedAndItalicInkIsNeverCut) {
+    ASSERT_TRUE(text.SetText(L"Wolf fly"));
+    enum Width { kAdvance, kWider, kEither };
+    const struct {
+        float skewX;
+        bool fakeBold, italic;
+        Width width;
+    } cases[] = {
+        {0.0f, false, false, kAdvance}, {0.0f, true, true, kEither}, {0.5f, false, false, kWider},
+        {0.5f, true, true, kEither},    {-2.0f, true, false, kWider}, {2.0f, true, false, kWider},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(testing::Message() << "skew " << c.skewX << " bold " << c.fakeBold << " italic " << c.italic);
+        Platform::Paint paint;
+        paint.size = 40.0f;
+        paint.skewX = c.skewX;
+        paint.embolden = c.fakeBold;
+        text.SetPaint(paint);
+        text.SetTextStyle(false, c.italic);
+        const GxGlyph* mask = MaskOf(0, 8);
+        ASSERT_NE(mask, nullptr);
+        const LineInk ink = InkOf(text, 0, 8);
+        EXPECT_EQ(std::accumulate(mask->buffer, mask->buffer + mask->width * mask->height, 0L), ink.coverage);
+        if (c.width != kEither) {
+            EXPECT_EQ(mask->width > int(ink.advance), c.width == kWider);
+        }
+        EXPECT_GE(mask->width, int(ink.advance));
     }
 }
 
