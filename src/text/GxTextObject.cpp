@@ -476,6 +476,26 @@ GxTextObject* GxTextObject::FindGxTextObject(int handle) {
     return GxTextInstanceManager::FindGxTextObject(handle);
 }
 
+// A line record shows a part of the text; one whose range lies outside it
+// was made for another text, and drawing it would give a silently blank line.
+// Without a text the drawing pass says so itself.
+bool GxTextObject::LinesInsideText() {
+    const int length = M->text != nullptr ? M->text->GetUTF16Size() - 1 : 0;
+    const int count = M->lineInfo != nullptr && length >= 1 ? M->lineInfo->GetCount() : 0;
+    for (int i = 0; i < count; ++i) {
+        const auto* line = static_cast<const GxLineInfo*>(M->lineInfo->Get(i));
+        if (line == nullptr || (line->start >= 0 && line->start <= line->end && line->end <= length)) continue;
+        Platform::LogPrint(Platform::kLogError, kTag,
+                           "RenderTextEffect(%p) - line %d [%d, %d) lies outside the text of %d units",
+                           static_cast<void*>(this), i, int(line->start), int(line->end), length);
+        GX_REPORT_ERROR(kTag, kErrorInvalidArgument);
+        Error::SetReason("line %d shows units [%d, %d) of a text of %d", i, int(line->start), int(line->end),
+                         length);
+        return false;
+    }
+    return true;
+}
+
 unsigned* GxTextObject::RenderTextEffect(int width, int height) {
     if (M == nullptr) {
         GX_REPORT_ERROR(kTag, kErrorNotConstructed);
@@ -491,6 +511,7 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
         GX_REPORT_ERROR(kTag, kErrorNotConstructed);
         return M->result != nullptr ? reinterpret_cast<unsigned*>(M->result->pixels) : nullptr;
     }
+    if (!LinesInsideText()) return nullptr;
 
     // Two images take turns, so a render allocates nothing once the size is
     // known and never hands out the previous result's pixels again (they were

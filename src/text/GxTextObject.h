@@ -74,10 +74,13 @@ public:
     // Renders a width x height picture: the effect stack's image of every
     // line over the background boxes, inside the gravity clip. The pixels
     // are 0xAARRGGBB words, straight alpha, owned by the object until the
-    // next render or its destruction. Null for negative sizes (code 7).
+    // next render or its destruction. Null (code 7, and a log line) for
+    // negative sizes and for a line record whose range lies outside the text.
     unsigned* RenderTextEffect(int width, int height);
 
 private:
+    bool LinesInsideText();
+
     GxTextObjectImpl* M = nullptr;
 };
 

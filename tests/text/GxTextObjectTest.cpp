@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "effect/GxEffect.h"
@@ -371,6 +372,29 @@ TEST_F(RenderTest, MissingTextOrLinesGiveATransparentPicture) {
     EXPECT_TRUE(std::all_of(none, none + 200, [](unsigned p) { return p == 0; }));
     EXPECT_EQ(text.RenderTextEffect(-1, 5), nullptr);
     EXPECT_EQ(Error::GetError(), 7);
+}
+
+TEST_F(RenderTest, ALineOutsideTheTextIsRefusedAndTheLastPictureKept) {
+    Prepare(L"abc", 20.0f);
+    AddLine(0, 3, 0, 20, -16, 4, 40);
+    HandOverLines();
+    const unsigned* good = Render(40, 30);
+    ASSERT_NE(good, nullptr);
+    const std::vector<unsigned> kept(good, good + size_t(width) * size_t(height));
+    LogCapture log;
+    for (auto range : {std::pair{1, 4}, std::pair{2, 1}, std::pair{-1, 2}}) {
+        AddLine(0, 3, 0, 20, -16, 4, 40);
+        AddLine(range.first, range.second, 0, 40, -16, 4, 40);
+        HandOverLines();
+        Error::SetError(0);
+        EXPECT_EQ(Render(40, 30), nullptr);
+        EXPECT_EQ(Error::GetError(), 7);
+        char expected[96];
+        std::snprintf(expected, sizeof expected, "RenderTextEffect(%p) - line 1 [%d, %d) lies outside the text of 3 units",
+                      static_cast<void*>(&text), range.first, range.second);
+        EXPECT_EQ(log.Count("GxTextObject", expected), 1);
+    }
+    EXPECT_TRUE(std::equal(kept.begin(), kept.end(), good));   // the last picture is still there
 }
 
 TEST_F(RenderTest, FallbackFamiliesDrawTheScriptsTheFontLacks) {
