@@ -15,6 +15,7 @@ packages=(
   g++-aarch64-linux-gnu qemu-user
   # text stack (shaping, glyph coverage, the system's font list) and real fonts for its tests
   libharfbuzz-dev libfreetype-dev libfontconfig-dev fonts-dejavu-core fonts-noto-core fonts-noto-cjk
+  fonts-noto-color-emoji
   # the Java bridge: JNI headers, javac and the JVM its tests run on
   openjdk-17-jdk-headless
   # the same libraries for the Arm build, installed beside the native ones

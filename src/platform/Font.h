@@ -22,6 +22,9 @@ public:
     // The face's family name as the font file states it ("" when it has none).
     virtual const char* FamilyName() const = 0;
     virtual uint32_t GlyphCount() const = 0;
+    // Whether its glyphs are in colour (emoji fonts): such a font is
+    // preferred for emoji, and its glyphs' coverage is their colour's alpha.
+    virtual bool HasColorGlyphs() const { return false; }
 };
 
 // Who frees the bytes a font is made from.

@@ -13,11 +13,19 @@
 // Without anti-aliasing a pixel is fully on when the glyph covers at least
 // half of it, else untouched. Without sub-pixel positioning each glyph's
 // origin is rounded to the nearest whole pixel first.
+//
+// Colour glyphs give coverage too: each colour layer is rasterised like an
+// outline with its coverage scaled by its colour's alpha (layers blend over
+// each other as glyphs do), and a glyph image from a colour strike is scaled,
+// stretched and slanted into the mask by ScaledBitmap. Fake bold leaves
+// images as they are.
 
+#include <algorithm>
 #include <cmath>
 
 #include "platform/TextLayout.h"
 #include "platform/linux/FontLinux.h"
+#include "platform/linux/ScaledBitmap.h"
 
 namespace Glimmer::Platform {
 namespace {
@@ -31,13 +39,8 @@ struct SpanTarget {
     int width;
     int height;
     bool antiAlias;
+    uint32_t alpha;   // of the layer's colour; 255 for plain outlines
 };
-
-// round(x / 255) for 0 <= x <= 255 * 255.
-inline uint32_t Div255(uint32_t x) {
-    x += 128;
-    return (x + (x >> 8)) >> 8;
-}
 
 void BlendSpans(int y, int count, const FT_Span* spans, void* user) {
     auto* target = static_cast<SpanTarget*>(user);
@@ -55,11 +58,9 @@ void BlendSpans(int y, int count, const FT_Span* spans, void* user) {
             if (s < 128) continue;
             s = 255;
         }
+        if (target->alpha != 255) s = Div255(s * target->alpha);
         if (s == 0) continue;
-        for (int x = x0; x < x1; ++x) {
-            uint32_t d = line[x];
-            line[x] = uint8_t(s + d - Div255(s * d));
-        }
+        for (int x = x0; x < x1; ++x) line[x] = CoverageOver(s, line[x]);
     }
 }
 
@@ -80,6 +81,17 @@ bool To26Dot6(float pixels, FT_Pos* out) {
     return true;
 }
 
+// A strike image drawn for `run` with its glyph origin at (x, y).
+BitmapPlacement Placement(const RunFont& run, const StrikeGlyph& glyph, float x, float y) {
+    BitmapPlacement placement;
+    placement.originX = x;
+    placement.originY = y;
+    placement.scale = run.size / glyph.ppem;
+    placement.scaleX = run.scaleX;
+    placement.skewX = run.skewX;
+    return placement;
+}
+
 }  // namespace
 
 void DrawGlyphs(const RunFont& run, const uint16_t* glyphIds, const float* positions, size_t count,
@@ -89,7 +101,7 @@ void DrawGlyphs(const RunFont& run, const uint16_t* glyphIds, const float* posit
         return;
     }
     auto* font = const_cast<FontLinux*>(static_cast<const FontLinux*>(run.font));
-    SpanTarget target{mask, width, height, run.antiAlias};
+    SpanTarget target{mask, width, height, run.antiAlias, 255};
     for (size_t i = 0; i < count; ++i) {
         float x = originX + positions[2 * i];
         float y = originY + positions[2 * i + 1];
@@ -99,7 +111,14 @@ void DrawGlyphs(const RunFont& run, const uint16_t* glyphIds, const float* posit
         }
         FT_Pos dx, dy;
         if (!To26Dot6(x, &dx) || !To26Dot6(y, &dy)) continue;
-        font->WithOutline(run, glyphIds[i], [&](FT_Outline* outline, FT_Library library) {
+        if (font->HasColorStrikes()) {
+            font->WithStrikeGlyph(run.size, glyphIds[i], false, [&](const StrikeGlyph& glyph) {
+                DrawScaledBitmap(glyph, Placement(run, glyph, x, y), run.antiAlias, mask, width, height);
+            });
+            continue;
+        }
+        font->WithLayers(run, glyphIds[i], [&](FT_Outline* outline, FT_Library library, uint8_t alpha) {
+            target.alpha = alpha;
             FT_Outline_Translate(outline, dx, -dy);
             FT_Raster_Params params = {};
             params.source = outline;
@@ -119,15 +138,30 @@ LayoutRect GlyphBounds(const RunFont& run, uint32_t glyphId) {
     LayoutRect bounds;
     if (!Drawable(run)) return bounds;
     auto* font = const_cast<FontLinux*>(static_cast<const FontLinux*>(run.font));
-    font->WithOutline(run, glyphId, [&](FT_Outline* outline, FT_Library) {
+    if (font->HasColorStrikes()) {
+        font->WithStrikeGlyph(run.size, glyphId, true, [&](const StrikeGlyph& glyph) {
+            bounds = ScaledBitmapBounds(glyph, Placement(run, glyph, 0.0f, 0.0f));
+        });
+        return bounds;
+    }
+    font->WithLayers(run, glyphId, [&](FT_Outline* outline, FT_Library, uint8_t) {
         if (outline->n_points == 0) return;
         FT_BBox box;
         FT_Outline_Get_CBox(outline, &box);
         // Whole pixels around the control box, y turned downwards.
-        bounds.left = float(box.xMin >> 6);
-        bounds.right = float((box.xMax + 63) >> 6);
-        bounds.top = -float((box.yMax + 63) >> 6);
-        bounds.bottom = -float(box.yMin >> 6);
+        LayoutRect layer;
+        layer.left = float(box.xMin >> 6);
+        layer.right = float((box.xMax + 63) >> 6);
+        layer.top = -float((box.yMax + 63) >> 6);
+        layer.bottom = -float(box.yMin >> 6);
+        if (bounds.IsEmpty()) {
+            bounds = layer;
+            return;
+        }
+        bounds.left = std::min(bounds.left, layer.left);
+        bounds.top = std::min(bounds.top, layer.top);
+        bounds.right = std::max(bounds.right, layer.right);
+        bounds.bottom = std::max(bounds.bottom, layer.bottom);
     });
     return bounds;
 }
