@@ -112,6 +112,7 @@ public:
         Glimmer::FontManager::GetInstance()->GetMinikinFontFamilies(
             families, drawing != nullptr ? drawing->GetFontPath() : nullptr, &weight);
         typeface_ = Glimmer::Platform::CreateTypefaceFromFamilies(families, weight, text->isItalicTextStyle());
+        typeface_->systemFallback = Glimmer::FontManager::GetInstance()->IsSystemFontFamiliesAlreadySet();
     }
 
     float operator()(size_t start, size_t end) const { return LayOut(start, end).advance; }

@@ -64,6 +64,10 @@ struct Typeface {
     FontFamilies families;
     int weight = 400;
     bool italic = false;
+    // Whether a character no family has may come from the system's
+    // last-resort fonts (SystemFallbackFont): where the system's families
+    // are in use.
+    bool systemFallback = false;
 };
 
 std::shared_ptr<Typeface> CreateTypefaceFromFamilies(const FontFamilies& families, int weight,

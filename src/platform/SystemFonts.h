@@ -4,8 +4,12 @@
 // the system font configuration. The records are plain descriptions; turning
 // them into loaded families is the font manager's job.
 
+#include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
+
+#include "platform/Font.h"
 
 namespace Glimmer::Platform {
 
@@ -28,5 +32,12 @@ struct SystemFontFamily {
 // The default family first (named "sans-serif"), then one fallback family per
 // script or language the system has a font for.
 std::vector<SystemFontFamily> GetSystemFontFamilies();
+
+// The last resort for a character no family of a typeface has: the first
+// font, in the system's order of preference for sans-serif text, that maps
+// `codePoint` (with `color`, only colour fonts are taken). Null when none
+// does. Fonts found here are loaded once and kept for the life of the
+// process; callers on any thread.
+std::shared_ptr<Font> SystemFallbackFont(uint32_t codePoint, bool color);
 
 }  // namespace Glimmer::Platform

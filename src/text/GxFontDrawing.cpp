@@ -2,7 +2,8 @@
 //
 // The pass takes the text's own font and the system's built families from
 // the font manager (weight 400 unless the font's name says otherwise, italic
-// from the text's style), adds the plain-text layer in the text colour and
+// from the text's style; once the system's families are set, the system's
+// last-resort fonts too), adds the plain-text layer in the text colour and
 // starts the effect stack on the destination's size. Then, line by line:
 //  - the line is shaped from its start to its visible end, with the text
 //    from the last line break before it (CR or LF at an index of 1 or more)
@@ -227,6 +228,8 @@ void GxFontDrawing::DrawTextEffect(GxTextObject* text, GxBitmap* dst) {
     }
     std::shared_ptr<Platform::Typeface> typeface =
         Platform::CreateTypefaceFromFamilies(families, weight, text->isItalicTextStyle());
+    // The system's last-resort fonts come with the system's families.
+    typeface->systemFallback = FontManager::GetInstance()->IsSystemFontFamiliesAlreadySet();
 
     const int leftOffset = effect->getLeftOffset();
     const int topOffset = effect->getTopOffset();

@@ -165,6 +165,7 @@ LineInk InkOf(GxTextObject& text, int start, int end) {
     int weight = 400;
     FontManager::GetInstance()->GetMinikinFontFamilies(families, text.GetFont()->GetFontPath(), &weight);
     auto typeface = Platform::CreateTypefaceFromFamilies(families, weight, text.isItalicTextStyle());
+    typeface->systemFallback = FontManager::GetInstance()->IsSystemFontFamiliesAlreadySet();
     std::unique_ptr<uint16_t[]> units(text.GetText()->GetUTF16());
     const Platform::Paint paint = text.GetPaint();
     Platform::Layout layout;

@@ -11,7 +11,17 @@
 //     that has the character supplies it, and inside the family the member
 //     closest to the style asked for that has it (weight distance, plus the
 //     distance of two weight classes for a slant mismatch). A character no
-//     family has stays with the previous font, or takes the first family's.
+//     family has comes from the system's last-resort font for it
+//     (SystemFallbackFont) when the typeface allows, else stays with the
+//     previous font, or takes the first family's (its missing-glyph box).
+//     An emoji sequence (a pictograph with its emoji variation selector, skin
+//     tone, tags or keycap, pictographs joined by ZWJ, a pair of regional
+//     indicators) is one unit: when it asks for emoji style (a selector,
+//     modifier, join, flag or keycap does; a lone pictograph does when emoji
+//     is its default presentation) the whole sequence takes the first colour
+//     font that has its first character, from the families or else from the
+//     system, so that the font's ligatures make one glyph of it. Otherwise
+//     its characters are chosen one by one as above.
 //     Common and inherited characters belong to the script around them. A
 //     new segment starts wherever font or script change.
 //  3. Shaping. Each segment is shaped by HarfBuzz in font units with the
@@ -28,14 +38,17 @@
 // emboldened; an upright member is slanted when italic is asked for.
 
 #include <unicode/ubidi.h>
+#include <unicode/uchar.h>
 
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <deque>
 #include <map>
 #include <string>
 
 #include "platform/LocaleList.h"
+#include "platform/SystemFonts.h"
 #include "platform/TextLayout.h"
 #include "platform/Unicode.h"
 #include "platform/linux/FontLinux.h"
@@ -98,19 +111,77 @@ uint32_t CodePointAt(const uint16_t* text, size_t i, size_t end, size_t* units) 
     return unit;
 }
 
+bool IsRegionalIndicator(uint32_t cp) { return cp >= 0x1F1E6 && cp <= 0x1F1FF; }
+bool IsEmojiModifier(uint32_t cp) { return cp >= 0x1F3FB && cp <= 0x1F3FF; }
+bool IsTag(uint32_t cp) { return cp >= 0xE0020 && cp <= 0xE007F; }
+constexpr uint32_t kZwj = 0x200D, kTextStyle = 0xFE0E, kEmojiStyle = 0xFE0F, kKeycap = 0x20E3;
+
+bool IsPictographic(uint32_t cp) {
+    // Every pictograph lies in these ranges; most text never reaches the lookup.
+    if (!((cp >= 0x00A9 && cp <= 0x3299) || (cp >= 0x1F000 && cp <= 0x1FFFF))) return false;
+    return u_hasBinaryProperty(UChar32(cp), UCHAR_EXTENDED_PICTOGRAPHIC) ||
+           u_hasBinaryProperty(UChar32(cp), UCHAR_EMOJI);
+}
+
+// The emoji sequence starting at text[start] (start < end), if one does:
+// sets *sequenceEnd past it and *emojiStyle to whether it asks for emoji
+// presentation. A keycap base (digit, '#', '*') starts one only with a
+// selector or keycap after it.
+bool EmojiSequence(const uint16_t* text, size_t start, size_t end, size_t* sequenceEnd, bool* emojiStyle) {
+    size_t units = 1;
+    const uint32_t base = CodePointAt(text, start, end, &units);
+    size_t at = start + units;
+    auto peek = [&](size_t i, size_t* n) { return i < end ? CodePointAt(text, i, end, n) : 0u; };
+    size_t n = 0;
+    if (IsRegionalIndicator(base)) {
+        *emojiStyle = true;
+        if (IsRegionalIndicator(peek(at, &n))) at += n;   // a flag is a pair
+        *sequenceEnd = at;
+        return true;
+    }
+    if (!IsPictographic(base)) {
+        const uint32_t next = peek(at, &n);
+        const bool keycapBase = (base >= '0' && base <= '9') || base == '#' || base == '*';
+        if (!(keycapBase && (next == kEmojiStyle || next == kKeycap))) return false;
+    }
+    bool emoji = u_hasBinaryProperty(UChar32(base), UCHAR_EMOJI_PRESENTATION);
+    for (;;) {
+        const uint32_t next = peek(at, &n);
+        if (next == kEmojiStyle || next == kKeycap || IsEmojiModifier(next) || IsTag(next)) {
+            emoji = true;
+        } else if (next == kTextStyle) {
+            emoji = false;
+        } else if (next == kZwj) {
+            size_t joined = 0;
+            if (!IsPictographic(peek(at + n, &joined))) break;
+            emoji = true;
+            n += joined;
+        } else {
+            break;
+        }
+        at += n;
+    }
+    *sequenceEnd = at;
+    *emojiStyle = emoji;
+    return true;
+}
+
+// Picks fonts for code points from the typeface's families, and from the
+// system's last-resort fonts, which it appends as families of its own.
 class FontChooser {
 public:
     explicit FontChooser(const Typeface& typeface) : typeface_(typeface) {}
 
-    FontChoice Choose(uint32_t cp, FontChoice previous) const {
+    FontChoice Choose(uint32_t cp, FontChoice previous) {
         if (previous.Valid() && StaysWithPrevious(cp) &&
             (IsDefaultIgnorableJoiner(cp) || Member(previous).font->HasGlyph(cp))) {
             return previous;
         }
-        for (size_t f = 0; f < typeface_.families.size(); ++f) {
+        for (size_t f = 0; f < FamilyCount(); ++f) {
             int member = BestMember(int(f), cp, true);
             if (member >= 0) return {int(f), member};
         }
+        if (FontChoice fallback = SystemFont(cp, false); fallback.Valid()) return fallback;
         if (previous.Valid()) return previous;
         for (size_t f = 0; f < typeface_.families.size(); ++f) {
             int member = BestMember(int(f), cp, false);
@@ -119,8 +190,21 @@ public:
         return {};
     }
 
+    // The first colour font that has `cp`: a family's, else the system's.
+    FontChoice ChooseColor(uint32_t cp) {
+        for (size_t f = 0; f < FamilyCount(); ++f) {
+            const FontFamily* family = Family(f);
+            if (family == nullptr) continue;
+            for (size_t m = 0; m < family->fonts.size(); ++m) {
+                const std::shared_ptr<Font>& font = family->fonts[m].font;
+                if (font != nullptr && font->HasColorGlyphs() && font->HasGlyph(cp)) return {int(f), int(m)};
+            }
+        }
+        return SystemFont(cp, true);
+    }
+
     const FontFamily::Member& Member(FontChoice choice) const {
-        return typeface_.families[size_t(choice.family)]->fonts[size_t(choice.member)];
+        return Family(size_t(choice.family))->fonts[size_t(choice.member)];
     }
 
     Fakery FakeryOf(FontChoice choice) const {
@@ -132,8 +216,28 @@ public:
     }
 
 private:
+    size_t FamilyCount() const { return typeface_.families.size() + system_.size(); }
+
+    const FontFamily* Family(size_t f) const {
+        const size_t own = typeface_.families.size();
+        return f < own ? typeface_.families[f].get() : &system_[f - own];
+    }
+
+    // The system's font for `cp` as a family of its own (one per font).
+    FontChoice SystemFont(uint32_t cp, bool color) {
+        if (!typeface_.systemFallback) return {};
+        std::shared_ptr<Font> font = SystemFallbackFont(cp, color);
+        if (font == nullptr) return {};
+        const size_t own = typeface_.families.size();
+        for (size_t i = 0; i < system_.size(); ++i) {
+            if (system_[i].fonts[0].font == font) return {int(own + i), 0};
+        }
+        system_.emplace_back(0u, 0, std::vector<FontFamily::Member>{{std::move(font), 400, false}});
+        return {int(own + system_.size() - 1), 0};
+    }
+
     int BestMember(int family, uint32_t cp, bool mustHave) const {
-        const FontFamily* f = typeface_.families[size_t(family)].get();
+        const FontFamily* f = Family(size_t(family));
         if (f == nullptr) return -1;
         int best = -1;
         int bestScore = 0;
@@ -152,6 +256,7 @@ private:
     }
 
     const Typeface& typeface_;
+    std::deque<FontFamily> system_;   // stable addresses: runs keep pointers to their fonts only
 };
 
 std::vector<DirectionalRun> SplitDirections(Bidi bidi, const uint16_t* text, size_t start,
@@ -193,8 +298,8 @@ std::vector<DirectionalRun> SplitDirections(Bidi bidi, const uint16_t* text, siz
 }
 
 // Font and script segments of one directional run, in logical order.
-std::vector<Segment> SplitSegments(const FontChooser& chooser, const uint16_t* text,
-                                   const DirectionalRun& run, FontChoice* previous) {
+std::vector<Segment> SplitSegments(FontChooser& chooser, const uint16_t* text, const DirectionalRun& run,
+                                   FontChoice* previous) {
     struct Unit {
         size_t start;
         size_t end;
@@ -207,6 +312,19 @@ std::vector<Segment> SplitSegments(const FontChooser& chooser, const uint16_t* t
     for (size_t i = run.start; i < end;) {
         size_t units = 1;
         uint32_t cp = CodePointAt(text, i, end, &units);
+        size_t sequenceEnd = 0;
+        bool emojiStyle = false;
+        if (EmojiSequence(text, i, end, &sequenceEnd, &emojiStyle) && emojiStyle) {
+            if (FontChoice color = chooser.ChooseColor(cp); color.Valid()) {
+                *previous = color;
+                while (i < sequenceEnd) {
+                    cp = CodePointAt(text, i, end, &units);
+                    points.push_back({i, i + units, color, uint32_t(hb_unicode_script(unicode, cp))});
+                    i += units;
+                }
+                continue;
+            }
+        }
         FontChoice font = chooser.Choose(cp, *previous);
         *previous = font;
         points.push_back({i, i + units, font, uint32_t(hb_unicode_script(unicode, cp))});
