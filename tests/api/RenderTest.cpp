@@ -16,6 +16,7 @@
 #include <iterator>
 #include <limits>
 #include <thread>
+#include <utility>
 
 #include "glimmer/glimmer.h"
 
@@ -364,6 +365,13 @@ TEST(RenderTextTest, OtherScriptsFallBackToTheSystemFonts) {
     const Picture book = Render(Sample("\xE6\x9C\xAC"));
     EXPECT_GT(Count(sun, sun, [](uint32_t c, uint32_t) { return Alpha(c) == 255; }), 20);
     EXPECT_NE(sun.image.pixels, book.image.pixels);
+    // So do scripts no family serves (Syriac, Javanese) and emoji, from any installed font that has them.
+    for (auto pair : {std::pair{"\xDC\x90", "\xDC\x92"}, std::pair{"\xEA\xA6\xB2", "\xEA\xA6\x8F"},
+                      std::pair{"\xF0\x9F\x8E\x89", "\xF0\x9F\x8E\x88"}}) {
+        const Picture first = Render(Sample(pair.first));
+        EXPECT_NE(first.image.pixels, Render(Sample(pair.second)).image.pixels) << pair.first;
+        EXPECT_GT(Count(first, first, [](uint32_t c, uint32_t) { return Alpha(c) == 255; }), 20) << pair.first;
+    }
 }
 
 TEST(RenderTextTest, RendersOnSeveralThreadsGiveOnePicture) {

@@ -1,5 +1,8 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cmath>
+#include <cstring>
 #include <limits>
 #include <map>
 #include <numeric>
@@ -8,6 +11,7 @@
 #include <vector>
 
 #include "platform/Font.h"
+#include "platform/SystemFonts.h"
 #include "platform/TextLayout.h"
 #include "text/TextFixtures.h"
 
@@ -319,6 +323,112 @@ TEST_F(TextLayoutTest, DrawingNeverWritesOutsideTheMask) {
     });
     for (int i = 0; i < 16; ++i) EXPECT_EQ(guarded[size_t(i)], 0x5A);
     for (size_t i = 16 + 64; i < guarded.size(); ++i) EXPECT_EQ(guarded[i], 0x5A);
+}
+
+TEST_F(TextLayoutTest, ColourStrikesDrawTheirAlphaAsCoverageAtAnySizeAndSlant) {
+    std::shared_ptr<Font> emoji = Open(Glimmer::Testing::kNotoColorEmoji);
+    ASSERT_NE(emoji, nullptr);
+    EXPECT_TRUE(emoji->HasColorGlyphs());
+    EXPECT_FALSE(sans->HasColorGlyphs());
+    Typeface typeface;
+    typeface.families = {FamilyOf({{emoji, 400, false}})};
+    int width, height;
+    auto maskAt = [&](const Paint& paint) {
+        Layout layout = LayOut(typeface, U16(u"\U0001F389"), paint);
+        EXPECT_EQ(layout.runs.size(), 1u);
+        return Draw(layout, paint, &width, &height);
+    };
+    Paint paint;
+    paint.size = 40.0f;
+    const std::vector<uint8_t> mask = maskAt(paint);
+    const double plain = double(Sum(mask));
+    EXPECT_NEAR(width - 2, 52, 3);   // the image is 1.25 em wide, give or take its filter's reach
+    EXPECT_GT(std::count(mask.begin(), mask.end(), uint8_t(255)), 200);   // opaque inside, not a faint copy
+    paint.size = 80.0f;
+    EXPECT_NEAR(double(Sum(maskAt(paint))), 4.0 * plain, 0.03 * 4.0 * plain);   // coverage grows with the area
+    paint.size = 40.0f;
+    paint.skewX = -0.5f;
+    EXPECT_NEAR(double(Sum(maskAt(paint))), plain, 0.03 * plain);   // a slant keeps the area, widens the box
+    EXPECT_GT(width - 2, 52 + 20);
+    paint.skewX = 0.0f;
+    paint.antiAlias = false;
+    for (uint8_t c : maskAt(paint)) ASSERT_TRUE(c == 0 || c == 255);
+
+    // A truncated file, and one whose images are damaged, are no fonts.
+    const std::vector<char>& bytes = Bytes(Glimmer::Testing::kNotoColorEmoji);
+    EXPECT_EQ(CreateFont(bytes.data(), bytes.size() / 2, 0, FontData::kBorrowed), nullptr);
+    std::vector<char> damaged = bytes;
+    const size_t tables = size_t(uint8_t(bytes[4])) << 8 | uint8_t(bytes[5]);
+    for (size_t t = 0; t < tables; ++t) {
+        const char* entry = bytes.data() + 12 + 16 * t;   // tag, checksum, offset, length
+        if (std::string(entry, 4) != "CBDT") continue;
+        size_t offset = 0, length = 0;
+        for (int i = 8; i < 12; ++i) offset = offset << 8 | uint8_t(entry[i]);
+        for (int i = 12; i < 16; ++i) length = length << 8 | uint8_t(entry[i]);
+        ASSERT_LE(offset + length, damaged.size());
+        std::fill(damaged.begin() + long(offset) + 4, damaged.begin() + long(offset + length), '\x5A');
+    }
+    EXPECT_EQ(CreateFont(damaged.data(), damaged.size(), 0, FontData::kBorrowed), nullptr);
+}
+
+TEST_F(TextLayoutTest, EmojiSequencesTakeAColourFontAsOneCluster) {
+    std::shared_ptr<Font> emoji = Open(Glimmer::Testing::kNotoColorEmoji);
+    ASSERT_NE(emoji, nullptr);
+    Typeface typeface;
+    typeface.families = {FamilyOf({{sans, 400, false}}), FamilyOf({{emoji, 400, false}})};
+    const struct {
+        const char16_t* text;
+        const char* fonts;   // one per glyph: 's' DejaVu, 'e' the emoji font
+    } cases[] = {
+        {u"\U0001F44D\U0001F3FD", "e"},         // skin tone
+        {u"\U0001F1EB\U0001F1F7", "e"},         // flag
+        {u"\U0001F469\u200D\U0001F4BB", "e"},   // ZWJ sequence
+        {u"#\uFE0F\u20E3", "e"},                // keycap
+        {u"\u2764\uFE0F", "e"},                 // DejaVu has the heart; the selector asks for emoji
+        {u"\u2764\uFE0E", "ss"},                // and for text (the selector shapes to a blank)
+        {u"A\u2728B", "ses"},                   // emoji by default
+        {u"#1", "ss"},                          // keycap bases alone stay text
+    };
+    for (const auto& c : cases) {
+        Layout layout = LayOut(typeface, U16(c.text));
+        ASSERT_EQ(layout.glyphs.size(), std::strlen(c.fonts)) << c.fonts;
+        for (size_t i = 0; i < layout.glyphs.size(); ++i) {
+            EXPECT_EQ(layout.glyphs[i].font, c.fonts[i] == 'e' ? emoji.get() : sans.get()) << c.fonts << " " << i;
+            EXPECT_NE(layout.glyphs[i].glyphId, 0u) << c.fonts << " " << i;
+        }
+    }
+}
+
+TEST_F(TextLayoutTest, CharactersNoFamilyHasComeFromTheSystemsFonts) {
+    Typeface typeface = regular;
+    typeface.systemFallback = true;
+    const struct {
+        const char16_t* text;
+        const char* family;
+    } cases[] = {
+        {u"\u0710\u0712", "Noto Sans Syriac"},
+        {u"\uA9B2\uA98F", "Noto Sans Javanese"},
+        {u"\U0001F389", "Noto Color Emoji"},
+        {u"ab", "DejaVu Sans"},
+    };
+    for (const auto& c : cases) {
+        Layout layout = LayOut(typeface, U16(c.text));
+        ASSERT_FALSE(layout.glyphs.empty()) << c.family;
+        for (const LayoutGlyph& glyph : layout.glyphs) {
+            EXPECT_STREQ(glyph.font->FamilyName(), c.family);
+            EXPECT_NE(glyph.glyphId, 0u);
+        }
+    }
+    // A character no installed font has is the first family's missing glyph;
+    // so is every character a typeface without the system's fonts lacks.
+    for (const Typeface* t : {&typeface, &regular}) {
+        Layout missing = LayOut(*t, U16(t == &regular ? u"\u0710" : u"\u0378"));
+        ASSERT_EQ(missing.glyphs.size(), 1u);
+        EXPECT_EQ(missing.glyphs[0].font, sans.get());
+        EXPECT_EQ(missing.glyphs[0].glyphId, 0u);
+    }
+    EXPECT_EQ(SystemFallbackFont(0x0710, false), SystemFallbackFont(0x0712, false));   // loaded once
+    EXPECT_EQ(SystemFallbackFont(0x0378, false), nullptr);
 }
 
 }  // namespace

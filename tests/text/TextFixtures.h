@@ -1,6 +1,7 @@
 #pragma once
 // Fonts and helpers shared by the text, font and platform tests. The fonts
-// are Debian's (fonts-dejavu-core, fonts-noto-core, fonts-noto-cjk); tests
+// are Debian's (fonts-dejavu-core, fonts-noto-core, fonts-noto-cjk,
+// fonts-noto-color-emoji); tests
 // check properties of what they draw, never exact bytes of a font version.
 
 #include <algorithm>
@@ -14,6 +15,7 @@ namespace Glimmer::Testing {
 inline const char* kDejaVuSans = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf";
 inline const char* kDejaVuSansBold = "/usr/share/fonts/truetype/dejavu/DejaVuSans-Bold.ttf";
 inline const char* kNotoCjk = "/usr/share/fonts/opentype/noto/NotoSansCJK-Regular.ttc";
+inline const char* kNotoColorEmoji = "/usr/share/fonts/truetype/noto/NotoColorEmoji.ttf";   // colour strikes
 
 inline std::vector<char> ReadFile(const char* path) {
     std::vector<char> bytes;

@@ -87,13 +87,15 @@ std::shared_ptr<Font> FontLinux::Create(const char* data, size_t size, int ttcIn
 }
 
 // A face whose strikes cannot give a single image of the first characters it
-// maps is broken (a damaged image table), however well its tables parse.
+// maps (blank ones aside) is broken, a damaged image table, however well its
+// tables parse.
 bool FontLinux::CanReadAStrikeGlyph() {
-    constexpr int kTries = 16;
+    constexpr int kTries = 64;
     FT_UInt glyph = 0;
     FT_ULong code = FT_Get_First_Char(face_, &glyph);
     for (int tries = 0; glyph != 0 && tries < kTries; ++tries) {
-        if (LoadStrikeGlyph(strikes_.back().ppem, glyph, false) != nullptr) return true;
+        const StrikeGlyph* image = LoadStrikeGlyph(strikes_.back().ppem, glyph, false);
+        if (image != nullptr && image->width > 0 && image->height > 0) return true;   // blanks prove nothing
         code = FT_Get_Next_Char(face_, code, &glyph);
     }
     return false;
