@@ -225,7 +225,12 @@ private:
 
     // The system's font for `cp` as a family of its own (one per font).
     FontChoice SystemFont(uint32_t cp, bool color) {
-        if (!typeface_.systemFallback) return {};
+        // Controls and format characters draw nothing: they stay where they are.
+        if (!typeface_.systemFallback || IsDefaultIgnorableJoiner(cp)) return {};
+        const auto category = hb_unicode_general_category(hb_unicode_funcs_get_default(), cp);
+        if (category == HB_UNICODE_GENERAL_CATEGORY_CONTROL || category == HB_UNICODE_GENERAL_CATEGORY_FORMAT) {
+            return {};
+        }
         std::shared_ptr<Font> font = SystemFallbackFont(cp, color);
         if (font == nullptr) return {};
         const size_t own = typeface_.families.size();
