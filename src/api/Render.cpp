@@ -25,6 +25,7 @@
 #include <cstring>
 #include <memory>
 #include <new>
+#include <vector>
 
 #include "api/CoreAccess.h"
 #include "api/EffectLayers.h"
@@ -113,35 +114,37 @@ public:
             families, drawing != nullptr ? drawing->GetFontPath() : nullptr, &weight);
         typeface_ = Glimmer::Platform::CreateTypefaceFromFamilies(families, weight, text->isItalicTextStyle());
         typeface_->systemFallback = Glimmer::FontManager::GetInstance()->IsSystemFontFamiliesAlreadySet();
+        for (size_t at = 1; at < utf16.size(); ++at) {
+            if (utf16[at] == 10 || utf16[at] == 13) breaks_.push_back(at);
+        }
     }
 
-    float operator()(size_t start, size_t end) const { return LayOut(start, end).advance; }
+    float operator()(size_t start, size_t end) const { return LayOut(start, end, false).advance; }
 
     // How far the line's mask reaches from its pen: its ink box's width,
     // which a slant or fake bold can make larger than the advance.
     float InkWidth(size_t start, size_t end) const {
-        const Glimmer::Platform::Layout layout = LayOut(start, end);
+        const Glimmer::Platform::Layout layout = LayOut(start, end, true);
         return layout.bounds.IsEmpty() ? 0.0f : layout.bounds.right - layout.bounds.left;
     }
 
 private:
-    Glimmer::Platform::Layout LayOut(size_t start, size_t end) const {
+    Glimmer::Platform::Layout LayOut(size_t start, size_t end, bool inkBounds) const {
         Glimmer::Platform::Layout layout;
         if (typeface_ == nullptr || end <= start) return layout;
+        // The last line break at or before `start` (never index 0), looked up
+        // rather than scanned for, so measuring a long paragraph stays linear.
         size_t contextStart = 0;
-        for (size_t at = start; at >= 1; --at) {
-            if (at < utf16_.size() && (utf16_[at] == 10 || utf16_[at] == 13)) {
-                contextStart = at;
-                break;
-            }
-        }
+        const auto after = std::upper_bound(breaks_.begin(), breaks_.end(), start);
+        if (after != breaks_.begin()) contextStart = *(after - 1);
         const auto* units = reinterpret_cast<const uint16_t*>(utf16_.data());
         Glimmer::Platform::LayoutText(paint_, Glimmer::Platform::Bidi::kDefaultLtr, *typeface_, units, utf16_.size(),
-                                      start, end - start, contextStart, end - contextStart, &layout);
+                                      start, end - start, contextStart, end - contextStart, &layout, inkBounds);
         return layout;
     }
 
     const std::u16string& utf16_;
+    std::vector<size_t> breaks_;  // positions >= 1 of '\n' and '\r', ascending
     Glimmer::Platform::Paint paint_;
     std::shared_ptr<Glimmer::Platform::Typeface> typeface_;
 };

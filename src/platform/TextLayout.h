@@ -73,10 +73,11 @@ struct Layout {
 // text[contextStart, contextStart + contextCount). False, with an empty
 // layout, when the ranges do not nest inside the text; a paint size that is
 // not a positive finite number, or a typeface without families, gives an
-// empty layout and true.
+// empty layout and true. Without `inkBounds` the bounds stay empty: measuring
+// an advance needs no glyph outline, and outlines are most of a layout's cost.
 bool LayoutText(const Paint& paint, Bidi bidi, const Typeface& typeface, const uint16_t* text,
                 size_t textLength, size_t start, size_t count, size_t contextStart,
-                size_t contextCount, Layout* out);
+                size_t contextCount, Layout* out, bool inkBounds = true);
 
 // How one font run is drawn: the paint's size, stretch and slant, with the
 // run's fakery added to the paint's own (fake italic leans by a quarter).

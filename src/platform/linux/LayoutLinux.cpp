@@ -431,7 +431,7 @@ RunFont ResolveRunFont(const Paint& paint, const FontRun& run) {
 
 bool LayoutText(const Paint& paint, Bidi bidi, const Typeface& typeface, const uint16_t* text,
                 size_t textLength, size_t start, size_t count, size_t contextStart,
-                size_t contextCount, Layout* out) {
+                size_t contextCount, Layout* out, bool inkBounds) {
     if (out == nullptr) return false;
     *out = Layout();
     constexpr size_t kMaxUnits = size_t(INT32_MAX) / 4;
@@ -505,6 +505,7 @@ bool LayoutText(const Paint& paint, Bidi bidi, const Typeface& typeface, const u
     hb_buffer_destroy(buffer);
     if (spacing != 0.0f && anyCluster) pen += spacing * 0.5f;
     out->advance = pen;
+    if (!inkBounds) return true;
 
     // Ink bounds, each distinct glyph of a run measured once.
     for (const FontRun& run : out->runs) {
