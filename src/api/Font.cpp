@@ -1,6 +1,6 @@
 // Fonts for the public API.
 //
-// A font is read (or copied from the caller's bytes), measured with FreeType
+// A font is read (or copied from the caller's bytes), measured by the platform
 // for the vertical metrics line layout needs, and handed to the core's font
 // store under a key: its path, or for bytes a name made of their hash, size
 // and the caller's name (the store takes weight and slant from the key's
@@ -8,20 +8,18 @@
 // of the process, so the handles are cached here by key too: a path is read
 // once, and the same bytes handed in twice are stored once.
 
-#include <ft2build.h>
-#include FT_FREETYPE_H
-#include FT_TRUETYPE_TABLES_H
-
 #include <cmath>
 #include <cstdio>
 #include <cstring>
 #include <map>
 #include <new>
+#include <utility>
 
 #include "api/CoreAccess.h"
 #include "api/FileBytes.h"
 #include "api/FontData.h"
 #include "font/FontManager.h"
+#include "platform/FontMetrics.h"
 
 namespace glimmer {
 namespace detail {
@@ -37,40 +35,17 @@ std::map<std::string, std::shared_ptr<const FontData>>& Cache() {
     return *cache;
 }
 
-// Measures face 0 of the font in `bytes`; false when FreeType cannot read it.
+// Measures face 0 of the font in `bytes`; false when it is no font.
 bool Measure(const char* bytes, std::size_t size, FontData* out) {
-    FT_Library library = nullptr;
-    if (FT_Init_FreeType(&library) != 0) return false;
-    FT_Face face = nullptr;
-    bool ok = FT_New_Memory_Face(library, reinterpret_cast<const FT_Byte*>(bytes), FT_Long(size), 0, &face) == 0;
-    if (ok) {
-        out->familyName = face->family_name != nullptr ? face->family_name : "";
-        out->unitsPerEm = float(face->units_per_EM);
-        out->boxTop = float(face->bbox.yMax);
-        out->boxBottom = float(face->bbox.yMin);
-        out->ascent = float(face->ascender);
-        out->descent = float(face->descender);
-        // FreeType leaves these unset for faces without outlines (colour
-        // emoji strikes); their header tables still have them.
-        const auto* head = static_cast<const TT_Header*>(FT_Get_Sfnt_Table(face, FT_SFNT_HEAD));
-        const auto* hhea = static_cast<const TT_HoriHeader*>(FT_Get_Sfnt_Table(face, FT_SFNT_HHEA));
-        if (face->units_per_EM == 0 && head != nullptr && hhea != nullptr) {
-            out->unitsPerEm = float(head->Units_Per_EM);
-            out->boxTop = float(head->yMax);
-            out->boxBottom = float(head->yMin);
-            out->ascent = float(hhea->Ascender);
-            out->descent = float(hhea->Descender);
-        }
-        ok = out->unitsPerEm > 0.0f;
-        const auto* os2 = static_cast<const TT_OS2*>(FT_Get_Sfnt_Table(face, FT_SFNT_OS2));
-        if (ok && os2 != nullptr && os2->version != 0xFFFF && (os2->fsSelection & (1u << 7)) != 0) {  // USE_TYPO_METRICS
-            out->ascent = float(os2->sTypoAscender);
-            out->descent = float(os2->sTypoDescender);
-        }
-    }
-    if (face != nullptr) FT_Done_Face(face);
-    FT_Done_FreeType(library);
-    return ok;
+    Glimmer::Platform::FontMetrics metrics;
+    if (!Glimmer::Platform::ReadFontMetrics(bytes, size, &metrics)) return false;
+    out->familyName = std::move(metrics.familyName);
+    out->unitsPerEm = metrics.unitsPerEm;
+    out->boxTop = metrics.boxTop;
+    out->boxBottom = metrics.boxBottom;
+    out->ascent = metrics.ascent;
+    out->descent = metrics.descent;
+    return true;
 }
 
 std::string Quoted(std::string_view text) {

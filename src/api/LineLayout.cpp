@@ -21,13 +21,12 @@
 
 #include "api/LineLayout.h"
 
-#include <unicode/brkiter.h>
-#include <unicode/unistr.h>
-
 #include <algorithm>
 #include <climits>
 #include <cmath>
 #include <memory>
+
+#include "platform/TextBreaks.h"
 
 namespace glimmer::detail {
 namespace {
@@ -43,34 +42,9 @@ size_t VisibleEnd(const std::u16string& text, size_t start, size_t end) {
     return end;
 }
 
-// Boundaries after position 0 of [start, end) found by an ICU iterator, as
-// absolute indices, ending with `end`.
-std::vector<size_t> Boundaries(icu::BreakIterator* iterator, const std::u16string& text, size_t start,
-                               size_t end) {
-    std::vector<size_t> out;
-    if (iterator != nullptr && end > start) {
-        icu::UnicodeString paragraph(false, reinterpret_cast<const UChar*>(text.data() + start),
-                                     int32_t(end - start));
-        iterator->setText(paragraph);
-        for (int32_t at = iterator->next(); at != icu::BreakIterator::DONE; at = iterator->next()) {
-            if (at > 0) out.push_back(start + size_t(at));
-        }
-    }
-    if (out.empty() || out.back() != end) out.push_back(end);
-    return out;
-}
-
-std::unique_ptr<icu::BreakIterator> MakeIterator(bool lines) {
-    UErrorCode status = U_ZERO_ERROR;
-    std::unique_ptr<icu::BreakIterator> iterator(
-        lines ? icu::BreakIterator::createLineInstance(icu::Locale::getRoot(), status)
-              : icu::BreakIterator::createCharacterInstance(icu::Locale::getRoot(), status));
-    if (U_FAILURE(status)) iterator.reset();
-    return iterator;
-}
-
 void BreakParagraph(const std::u16string& text, size_t start, size_t end, const MeasureFn& measure,
-                    float wrapWidth, icu::BreakIterator* lineIterator, icu::BreakIterator* graphemes,
+                    float wrapWidth, Glimmer::Platform::TextBreaker* lineBreaks,
+                    Glimmer::Platform::TextBreaker* graphemes,
                     std::vector<LayoutLine>* out) {
     auto emit = [&](size_t from, size_t to, float width) {
         LayoutLine line;
@@ -86,7 +60,7 @@ void BreakParagraph(const std::u16string& text, size_t start, size_t end, const 
         return;
     }
 
-    const std::vector<size_t> opportunities = Boundaries(lineIterator, text, start, end);
+    const std::vector<size_t> opportunities = lineBreaks->Boundaries(text.data(), start, end);
     size_t lineStart = start;
     size_t next = 0;   // the first opportunity not yet known to fit
     while (lineStart < end) {
@@ -112,7 +86,7 @@ void BreakParagraph(const std::u16string& text, size_t start, size_t end, const 
         }
         // One word alone is too wide: cut it between clusters.
         const size_t wordEnd = opportunities[next];
-        const std::vector<size_t> clusters = Boundaries(graphemes, text, lineStart, wordEnd);
+        const std::vector<size_t> clusters = graphemes->Boundaries(text.data(), lineStart, wordEnd);
         size_t cut = clusters.front();
         auto visibleWidth = [&](size_t to) {
             const size_t visible = VisibleEnd(text, lineStart, to);
@@ -140,10 +114,11 @@ int TruncateToInt(float value) {
 }  // namespace
 
 std::vector<LayoutLine> BreakLines(const std::u16string& text, const MeasureFn& measure, float wrapWidth) {
-    std::unique_ptr<icu::BreakIterator> lineIterator, graphemes;
+    using Glimmer::Platform::TextBreaker;
+    std::unique_ptr<TextBreaker> lineBreaks, graphemes;
     if (wrapWidth > 0.0f) {
-        lineIterator = MakeIterator(true);
-        graphemes = MakeIterator(false);
+        lineBreaks = std::make_unique<TextBreaker>(TextBreaker::Kind::kLine);
+        graphemes = std::make_unique<TextBreaker>(TextBreaker::Kind::kGrapheme);
     }
     std::vector<LayoutLine> lines;
     size_t start = 0;
@@ -151,7 +126,7 @@ std::vector<LayoutLine> BreakLines(const std::u16string& text, const MeasureFn& 
         const size_t newline = text.find(u'\n', start);
         const size_t end = newline == std::u16string::npos ? text.size() : newline;
         const size_t before = lines.size();
-        BreakParagraph(text, start, end, measure, wrapWidth, lineIterator.get(), graphemes.get(), &lines);
+        BreakParagraph(text, start, end, measure, wrapWidth, lineBreaks.get(), graphemes.get(), &lines);
         if (newline == std::u16string::npos) break;
         // The break belongs to the paragraph's last line.
         if (lines.size() > before) lines.back().end = int(newline + 1);
