@@ -140,8 +140,8 @@ int main(int argc, char** argv) {
         }
 
         std::string command = renderer;
-        for (const std::string& arg : args) command += " " + Shell(arg);
-        command += " -o " + f[0] + ".png";
+        for (const std::string& arg : args) command.append(" ").append(Shell(arg));
+        command.append(" -o ").append(f[0]).append(".png");
 
         std::string got;
         try {
