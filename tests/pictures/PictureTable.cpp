@@ -1,6 +1,6 @@
 // The picture table: renders every case of pictures.tsv through the renderer's
-// request parser and the public render call, and compares a hash of the bitmap,
-// its margins and its pixels with the recorded one. The same table runs in every
+// request parser and the public render call, and compares a hash of the bitmap
+// size, its margins, its pixels and where each line landed with the recorded one. The same table runs in every
 // build, so x86-64 and 64-bit Arm are held to the same pixels.
 //
 //   picture_tests TABLE RENDERER           check; prints the first differing case
@@ -149,6 +149,9 @@ int main(int argc, char** argv) {
             Hash hash;
             for (int v : {r.image.width, r.image.height, r.left, r.top, r.right, r.bottom}) hash.Add(v);
             hash.Add(r.image.pixels.data(), r.image.pixels.size() * sizeof(uint32_t));
+            for (const glimmer::Line& l : r.lines) {
+                for (int v : {int(l.begin), int(l.end), l.x, l.baseline, l.width, l.top, l.bottom}) hash.Add(v);
+            }
             got = hash.Hex();
         } catch (const std::exception& e) {
             got = std::string("error: ") + e.what();
