@@ -1,6 +1,7 @@
 // The picture table: renders every case of pictures.tsv through the renderer's
 // request parser and the public render call, and compares a hash of the bitmap
-// size, its margins, its pixels and where each line landed with the recorded one. The same table runs in every
+// size, its margins, its pixels and where each line landed with the recorded one
+// (mode "gallery": the renderer's contact sheet of the text). The same table runs in every
 // build, so x86-64 and 64-bit Arm are held to the same pixels.
 //
 //   picture_tests TABLE RENDERER           check; prints the first differing case
@@ -20,6 +21,7 @@
 #include <string>
 #include <vector>
 
+#include "Gallery.h"
 #include "Options.h"
 #include "Renderer.h"
 
@@ -123,13 +125,14 @@ int main(int argc, char** argv) {
             continue;
         }
         // NAME TEXT FONT SIZE MODE OPTIONS HASH
-        if (f.size() != 7 || !fonts.count(f[2]) || (f[4] != "style" && f[4] != "exact")) {
+        const bool gallery = f.size() == 7 && f[4] == "gallery";
+        if (f.size() != 7 || !fonts.count(f[2]) || (f[4] != "style" && f[4] != "exact" && !gallery)) {
             std::fprintf(stderr, "%smalformed case (name, text, font, size, mode, options, hash by tabs)\n",
                          where.c_str());
             return 2;
         }
         std::vector<std::string> args = {f[1], "--font", fonts[f[2]].path, "--size", f[3]};
-        if (f[4] == "exact") args.push_back("--exact");
+        if (f[4] != "style") args.push_back("--" + f[4]);
         for (std::string option : Split(f[5], ' ')) {
             // Tiles lie beside the table, wherever the program runs from.
             const size_t tile = option.find("tile=");
@@ -145,7 +148,12 @@ int main(int argc, char** argv) {
 
         std::string got;
         try {
-            const RenderResult r = Render(ParseCommandLine(args).request);
+            RenderResult r;
+            if (gallery) {
+                r.image = RenderGallery(f[1], fonts[f[2]].path);
+            } else {
+                r = Render(ParseCommandLine(args).request);
+            }
             Hash hash;
             for (int v : {r.image.width, r.image.height, r.left, r.top, r.right, r.bottom}) hash.Add(v);
             hash.Add(r.image.pixels.data(), r.image.pixels.size() * sizeof(uint32_t));

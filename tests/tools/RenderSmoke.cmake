@@ -5,7 +5,6 @@
 #   errors   bad input of each kind the program maps to an exit status: that
 #            status, one line on stderr naming the problem, and no PNG written
 #            (the messages of every parser are checked in-process)
-#   gallery  the contact sheet renders
 # Arguments: -DRENDER=<program> -DWORK=<scratch folder> -DCASE=<group>
 # [-DEMULATOR=<runner>] (the cross build's qemu).
 
@@ -123,18 +122,6 @@ elseif(CASE STREQUAL "errors")
   render(--help)
   if(NOT rc EQUAL 0 OR NOT out MATCHES "outer-shadow" OR NOT out MATCHES "highlight-opacity=0.75")
     fail("--help: exit ${rc}")
-  endif()
-elseif(CASE STREQUAL "gallery")
-  render(--gallery -o gallery.png)
-  if(NOT rc EQUAL 0 OR NOT out MATCHES "gallery [0-9]+x[0-9]+, 20 cells")
-    fail("gallery: exit ${rc}: ${out}${err}")
-  elseif(NOT EXISTS "${WORK}/gallery.png")
-    fail("gallery: no PNG written")
-  else()
-    png_size("${WORK}/gallery.png" w h)
-    if(w LESS 800 OR h LESS 600)
-      fail("gallery: only ${w}x${h}")
-    endif()
   endif()
 else()
   message(FATAL_ERROR "unknown CASE '${CASE}'")
