@@ -173,8 +173,12 @@ int main(int argc, char** argv) {
         } else {
             if (failed++ == 0) {
                 const auto bad = badFonts.find(f[2]);
-                std::printf("%scase '%s' gives %s, recorded %s\n", where.c_str(), f[0].c_str(), got.c_str(),
-                            f[6].c_str());
+                if (got.rfind("error: ", 0) == 0) {
+                    std::printf("%scase '%s' no longer renders: %s\n", where.c_str(), f[0].c_str(), got.c_str() + 7);
+                } else {
+                    std::printf("%scase '%s' renders other pixels than recorded (hash %s, recorded %s)\n",
+                                where.c_str(), f[0].c_str(), got.c_str(), f[6].c_str());
+                }
                 if (bad != badFonts.end()) std::printf("  %s\n", bad->second.c_str());
                 std::printf("  see it: %s\n", command.c_str());
             }
