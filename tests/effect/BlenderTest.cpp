@@ -45,48 +45,54 @@ Px Mode(int mode, unsigned color, Px dst, uint8_t m) {
     });
 }
 
+Px Words(int mode, uint32_t src, Px dst) {
+    GxBitmap b(1, 1, 4);
+    Set(b, 0, 0, dst);
+    GxBlender::drawBitmapBlend32(0, 0, &b, &src, 1, 1, 1, mode);
+    return Get(b, 0, 0);
+}
+
 // --- blend rules, one hand-computed pixel per case
 
-TEST(BlenderRules, SourceOverCoverage) {
-    // s = 129 * 255 -> a = 128, k = 127.
-    EXPECT_EQ(Mode(1, 0x80FF8040, Px{10, 20, 30, 40}, 255), (Px{255, 138, 79, 148}));
-    // Fully opaque coverage replaces the pixel with the colour.
-    EXPECT_EQ(Mode(1, 0xFF112233, Px{9, 9, 9, 9}, 255), (Px{0x11, 0x22, 0x33, 255}));
-    // Faint coverage leaves no trace: (254 + 1) * 1 does not exceed 255 ...
-    EXPECT_EQ(Mode(1, 0xFEFFFFFF, Px{1, 2, 3, 4}, 1), (Px{1, 2, 3, 4}));
-    EXPECT_EQ(Mode(1, 0x00FFFFFF, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4}));
-    // ... while (255 + 1) * 1 does: a = 1, k = 254.
-    EXPECT_EQ(Mode(1, 0xFFFFFFFF, Px{0, 0, 0, 0}, 1), (Px{1, 1, 1, 1}));
-}
-
-TEST(BlenderRules, DestinationOverCoverage) {
-    EXPECT_EQ(Mode(2, 0xFF204060, Px{0, 0, 0, 0}, 128), (Px{16, 32, 48, 128}));
-    EXPECT_EQ(Mode(2, 0xFF204060, Px{100, 50, 25, 128}, 128), (Px{108, 66, 49, 191}));
-    EXPECT_EQ(Mode(2, 0xFF204060, Px{1, 2, 3, 4}, 0), (Px{1, 2, 3, 4}));
-}
-
-TEST(BlenderRules, DestinationOverCoverageAsSwitch) {
-    // Any non-zero coverage draws the full colour.
-    EXPECT_EQ(Mode(3, 0x80402010, Px{0, 0, 0, 0}, 1), (Px{64, 32, 16, 128}));
-    EXPECT_EQ(Mode(3, 0x80402010, Px{10, 10, 10, 100}, 1), (Px{49, 29, 20, 178}));
-    EXPECT_EQ(Mode(3, 0x80402010, Px{10, 10, 10, 100}, 0), (Px{10, 10, 10, 100}));
-}
-
-TEST(BlenderRules, TextFillScalesByCoverage) {
-    const unsigned grey = 0xFF808080;
-    // Clear destination: the coverage-scaled colour.
-    EXPECT_EQ(Mode(7, grey, Px{0, 0, 0, 0}, 128), (Px{64, 64, 64, 128}));
-    // Full coverage: destination-over with the unscaled colour.
-    EXPECT_EQ(Mode(7, grey, Px{10, 20, 30, 100}, 255), (Px{88, 98, 108, 255}));
-    EXPECT_EQ(Mode(7, 0x80808080, Px{10, 20, 30, 100}, 255), (Px{88, 98, 108, 178}));
-    // Over an opaque pixel, coverage 128 leaves alpha 128 and halves the colour.
-    EXPECT_EQ(Mode(7, grey, Px{200, 100, 50, 255}, 128), (Px{100, 50, 25, 128}));
-    // Partial over partial: combined, then scaled by m.
-    EXPECT_EQ(Mode(7, grey, Px{40, 40, 40, 100}, 128), (Px{40, 40, 40, 89}));
-    // Outside the glyphs nothing is touched.
-    EXPECT_EQ(Mode(7, grey, Px{40, 40, 40, 100}, 0), (Px{40, 40, 40, 100}));
-    // A product past 16 bits saturates instead of wrapping (505 would read as 249).
-    EXPECT_EQ(Mode(7, 0xFFFF0000, Px{255, 0, 0, 1}, 254), (Px{255, 0, 0, 253}));
+TEST(BlenderRules, OnePixelByHand) {
+    const struct {
+        bool words;     // a 32-bit source word instead of a coverage byte
+        int mode;
+        uint32_t color;   // the colour, or the source word
+        Px dst;
+        uint8_t m;
+        Px expected;
+        const char* why;
+    } cases[] = {
+        {false, 1, 0x80FF8040, {10, 20, 30, 40}, 255, {255, 138, 79, 148}, "source-over: s = 129 * 255, a = 128"},
+        {false, 1, 0xFF112233, {9, 9, 9, 9}, 255, {0x11, 0x22, 0x33, 255}, "opaque coverage replaces"},
+        {false, 1, 0xFEFFFFFF, {1, 2, 3, 4}, 1, {1, 2, 3, 4}, "(254 + 1) * 1 leaves no trace"},
+        {false, 1, 0x00FFFFFF, {1, 2, 3, 4}, 255, {1, 2, 3, 4}, "transparent colour"},
+        {false, 1, 0xFFFFFFFF, {0, 0, 0, 0}, 1, {1, 1, 1, 1}, "(255 + 1) * 1 does"},
+        {false, 2, 0xFF204060, {0, 0, 0, 0}, 128, {16, 32, 48, 128}, "destination-over by coverage"},
+        {false, 2, 0xFF204060, {100, 50, 25, 128}, 128, {108, 66, 49, 191}, "destination-over, partial"},
+        {false, 2, 0xFF204060, {1, 2, 3, 4}, 0, {1, 2, 3, 4}, "no coverage"},
+        {false, 3, 0x80402010, {0, 0, 0, 0}, 1, {64, 32, 16, 128}, "coverage as a switch"},
+        {false, 3, 0x80402010, {10, 10, 10, 100}, 1, {49, 29, 20, 178}, "switch over partial"},
+        {false, 3, 0x80402010, {10, 10, 10, 100}, 0, {10, 10, 10, 100}, "switch off"},
+        {false, 7, 0xFF808080, {0, 0, 0, 0}, 128, {64, 64, 64, 128}, "fill: coverage-scaled on clear"},
+        {false, 7, 0xFF808080, {10, 20, 30, 100}, 255, {88, 98, 108, 255}, "fill: full coverage, unscaled"},
+        {false, 7, 0x80808080, {10, 20, 30, 100}, 255, {88, 98, 108, 178}, "fill: translucent colour"},
+        {false, 7, 0xFF808080, {200, 100, 50, 255}, 128, {100, 50, 25, 128}, "fill over opaque halves"},
+        {false, 7, 0xFF808080, {40, 40, 40, 100}, 128, {40, 40, 40, 89}, "fill: combined, then scaled"},
+        {false, 7, 0xFF808080, {40, 40, 40, 100}, 0, {40, 40, 40, 100}, "fill outside the glyphs"},
+        {false, 7, 0xFFFF0000, {255, 0, 0, 1}, 254, {255, 0, 0, 253}, "saturates past 16 bits (not 249)"},
+        {true, 1, 0x80402010, {100, 100, 100, 200}, 0, {114, 82, 66, 227}, "image source-over"},
+        {true, 1, 0xFF010203, {100, 100, 100, 200}, 0, {1, 2, 3, 255}, "opaque image source-over"},
+        {true, 1, 0x00000000, {100, 90, 80, 70}, 0, {100, 90, 80, 70}, "transparent image source-over"},
+        {true, 2, 0x80402010, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "image destination-over"},
+        {true, 2, 0x80402010, {0, 0, 0, 0}, 0, {64, 32, 16, 128}, "image destination-over on clear"},
+        {true, 2, 0x00402010, {0, 0, 0, 0}, 0, {0, 0, 0, 0}, "transparent image destination-over"},
+        {true, 3, 0x80402010, {7, 7, 7, 7}, 0, {7, 7, 7, 7}, "images know no mode 3"},
+    };
+    for (const auto& c : cases) {
+        EXPECT_EQ(c.words ? Words(c.mode, c.color, c.dst) : Mode(c.mode, c.color, c.dst, c.m), c.expected) << c.why;
+    }
 }
 
 TEST(BlenderRules, UnknownModesDrawNothing) {
@@ -124,27 +130,6 @@ TEST(BlenderRules, MaskUnionKeepsLargerCoverage) {
     EXPECT_EQ(mask.pixels[0], 50);
     EXPECT_EQ(mask.pixels[1], 200);
     EXPECT_EQ(mask.pixels[2], 7);
-}
-
-Px Words(int mode, uint32_t src, Px dst) {
-    GxBitmap b(1, 1, 4);
-    Set(b, 0, 0, dst);
-    GxBlender::drawBitmapBlend32(0, 0, &b, &src, 1, 1, 1, mode);
-    return Get(b, 0, 0);
-}
-
-TEST(BlenderRules, SourceOverImage) {
-    EXPECT_EQ(Words(1, 0x80402010, Px{100, 100, 100, 200}), (Px{114, 82, 66, 227}));
-    EXPECT_EQ(Words(1, 0xFF010203, Px{100, 100, 100, 200}), (Px{1, 2, 3, 255}));
-    // A transparent premultiplied source changes nothing.
-    EXPECT_EQ(Words(1, 0x00000000, Px{100, 90, 80, 70}), (Px{100, 90, 80, 70}));
-}
-
-TEST(BlenderRules, DestinationOverImage) {
-    EXPECT_EQ(Words(2, 0x80402010, Px{10, 10, 10, 100}), (Px{49, 29, 20, 178}));
-    EXPECT_EQ(Words(2, 0x80402010, Px{0, 0, 0, 0}), (Px{64, 32, 16, 128}));
-    EXPECT_EQ(Words(2, 0x00402010, Px{0, 0, 0, 0}), (Px{0, 0, 0, 0}));
-    EXPECT_EQ(Words(3, 0x80402010, Px{7, 7, 7, 7}), (Px{7, 7, 7, 7}));
 }
 
 TEST(BlenderRules, DestinationOverByteImageAndItsFlag) {

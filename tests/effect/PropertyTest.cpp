@@ -6,6 +6,7 @@
 #include <cmath>
 #include <cstdint>
 #include <cstring>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -46,82 +47,56 @@ std::string Colour(uint32_t c) {
     return s;
 }
 
-TEST(PropertyKey, TextIsLetterAndColourNibbles) {
-    GxTextProperty text(0xFF336699, 0.3f);
-    EXPECT_EQ(text.getSequentialCharLength(), 9);
-    EXPECT_EQ(Key(text), Join({"T", Bytes({0x8F, 0x8F, 0x83, 0x83, 0x86, 0x86, 0x89, 0x89})}));
-}
-
-TEST(PropertyKey, ShadowsWriteAngleDistanceSizeColour) {
-    GxOuterShadowProperty outer(-30.0f, 5.9f, 130.0f, 0x01234567, 1.0f);
-    EXPECT_EQ(outer.getSequentialCharLength(), 13);
-    // -30 is written as 330: 2 * 128 + 74. Size 130 keeps its low seven bits.
-    EXPECT_EQ(Key(outer), Join({"S", Bytes({0x82, 0xCA, 0x85, 0x82}), Colour(0x01234567)}));
-
-    GxInnerShadowProperty inner(45.0f, 0.0f, 3.0f, 0xFF000000, 1.0f);
-    EXPECT_EQ(inner.getSequentialCharLength(), 13);
-    EXPECT_EQ(Key(inner), Join({"I", Bytes({0x80, 0xAD, 0x80, 0x83}), Colour(0xFF000000)}));
-}
-
-TEST(PropertyKey, StrokeWritesBothIntegers) {
-    GxStrokeProperty stroke(5.7f, 0x12345678, 1.0f, 3, 1);
-    EXPECT_EQ(stroke.getSequentialCharLength(), 12);
-    EXPECT_EQ(Key(stroke), Join({"K", Bytes({0x85}), Colour(0x12345678), Bytes({0x83, 0x81})}));
-}
-
-TEST(PropertyKey, GlowsReserveOneSpareBytePerStop) {
-    GxGradient stops[3] = {{0xFF000000, 1.0f, 0.0f}, {0x80FFFFFF, 1.0f, 0.5f}, {0x00123456, 1.0f, 0.999f}};
-    GxOuterGlowProperty glow(12.0f, 0xFF00FF00, 1.0f, 3, stops);
-    EXPECT_EQ(glow.getSequentialCharLength(), 40);
-    const std::string key = Key(glow);
-    EXPECT_EQ(key.size(), 37u);
-    EXPECT_EQ(key, Join({"G", Bytes({0x8C}), Colour(0xFF00FF00), Colour(0xFF000000), Bytes({0x80}),
-                         Colour(0x80FFFFFF), Bytes({0xB2}), Colour(0x00123456), Bytes({0x80 | 99})}));
-
-    GxInnerGlowProperty inner(1.0f, 0, 1.0f, 0, nullptr);
-    EXPECT_EQ(inner.getSequentialCharLength(), 10);
-    EXPECT_EQ(Key(inner), Join({"N", Bytes({0x81}), Colour(0)}));
-    // Stops that are not there are never read, whatever the count says.
-    GxOuterGlowProperty missing(1.0f, 0, 1.0f, 4, nullptr);
-    EXPECT_EQ(Key(missing).size(), 10u);
-    GxOuterGlowProperty negative(1.0f, 0, 1.0f, -7, stops);
-    EXPECT_EQ(negative.getSequentialCharLength(), 10);
-    EXPECT_EQ(Key(negative).size(), 10u);
-}
-
-TEST(PropertyKey, GradientsWriteAngleScaleAndStops) {
-    GxGradient stops[2] = {{0xFF000000, 1.0f, 0.5f}, {0xFFFFFFFF, 1.0f, 1.0f}};
-    GxLinearGradientProperty linear(45.0f, 1.5f, 1.0f, 2, stops);
-    EXPECT_EQ(linear.getSequentialCharLength(), 25);
-    // Scale 1.5 -> 150 = 0x96 as two nibbles.
-    EXPECT_EQ(Key(linear), Join({"L", Bytes({0x80, 0xAD, 0x89, 0x86}), Colour(0xFF000000),
-                                 Bytes({0xB2}), Colour(0xFFFFFFFF), Bytes({0x80 | 100})}));
-    GxRadialGradientProperty radial(0.0f, 2.0f, 1.0f, 0, nullptr);
-    EXPECT_EQ(radial.getSequentialCharLength(), 5);
-    EXPECT_EQ(Key(radial), Join({"D", Bytes({0x80, 0x80, 0x8C, 0x88})}));  // 200 = 0xC8
-}
-
-TEST(PropertyKey, BevelAndEmbossWriteThirtyBytes) {
-    GxBevelProperty bevel(1, 3.5f, 12.34f, 1, 0, 4, 0.8f, 120.0f, 30.0f, 0xFFFFFFFF, 1.0f,
-                          0xFF000000, 1.0f);
-    EXPECT_EQ(bevel.getSequentialCharLength(), 30);
-    // depth 3 as two nibbles, size 1234 = 0x04D2 as four, then 1, 0, 4, angle
-    // 120 (0, 120), altitude 30, the two colours.
-    EXPECT_EQ(Key(bevel), Join({"B",
-                                Bytes({0x81, 0x80, 0x83, 0x80, 0x84, 0x8D, 0x82, 0x81, 0x80, 0x84, 0x80,
-                                       0x80 | 120, 0x80 | 30}),
-                                Colour(0xFFFFFFFF), Colour(0xFF000000)}));
-    GxEmbossProperty emboss(3, 0.0f, 0.0f, 0, 1, 0, 1.0f, 0.0f, 0.0f, 0, 0.0f, 0, 0.0f);
-    EXPECT_EQ(emboss.getSequentialCharLength(), 30);
-    EXPECT_EQ(Key(emboss)[0], 'E');
-    EXPECT_EQ(Key(emboss).size(), 30u);
-}
-
-TEST(PropertyKey, PatternWritesItsOpacity) {
+TEST(PropertyKey, EveryKindByHand) {
+    GxGradient glowStops[3] = {{0xFF000000, 1.0f, 0.0f}, {0x80FFFFFF, 1.0f, 0.5f}, {0x00123456, 1.0f, 0.999f}};
+    GxGradient rampStops[2] = {{0xFF000000, 1.0f, 0.5f}, {0xFFFFFFFF, 1.0f, 1.0f}};
     GxBitmap tile(2, 2, 4);
-    GxPatternProperty pattern(&tile, 2.5f, 0.5f);
-    EXPECT_EQ(pattern.getSequentialCharLength(), 17);
-    EXPECT_EQ(Key(pattern), Join({"P", Colour(0), Bytes({0x80, 0x80, 0x8F, 0x8A, 0x80, 0x80, 0x83, 0x82})}));
+    const struct {
+        GxProperty* record;
+        int reserved;
+        std::string key;
+        const char* why;
+    } cases[] = {
+        {new GxTextProperty(0xFF336699, 0.3f), 9, Join({"T", Colour(0xFF336699)}), "letter and colour"},
+        {new GxOuterShadowProperty(-30.0f, 5.9f, 130.0f, 0x01234567, 1.0f), 13,
+         Join({"S", Bytes({0x82, 0xCA, 0x85, 0x82}), Colour(0x01234567)}),
+         "-30 as 330 = 2 * 128 + 74; size 130 keeps its low seven bits"},
+        {new GxInnerShadowProperty(45.0f, 0.0f, 3.0f, 0xFF000000, 1.0f), 13,
+         Join({"I", Bytes({0x80, 0xAD, 0x80, 0x83}), Colour(0xFF000000)}), "inner shadow"},
+        {new GxStrokeProperty(5.7f, 0x12345678, 1.0f, 3, 1), 12,
+         Join({"K", Bytes({0x85}), Colour(0x12345678), Bytes({0x83, 0x81})}), "stroke: both integers"},
+        {new GxOuterGlowProperty(12.0f, 0xFF00FF00, 1.0f, 3, glowStops), 40,
+         Join({"G", Bytes({0x8C}), Colour(0xFF00FF00), Colour(0xFF000000), Bytes({0x80}), Colour(0x80FFFFFF),
+               Bytes({0xB2}), Colour(0x00123456), Bytes({0x80 | 99})}),
+         "glow: one spare byte a stop"},
+        {new GxInnerGlowProperty(1.0f, 0, 1.0f, 0, nullptr), 10, Join({"N", Bytes({0x81}), Colour(0)}), "no stops"},
+        {new GxOuterGlowProperty(1.0f, 0, 1.0f, 4, nullptr), 50, Join({"G", Bytes({0x81}), Colour(0)}),
+         "missing stops are never read"},
+        {new GxOuterGlowProperty(1.0f, 0, 1.0f, -7, glowStops), 10, Join({"G", Bytes({0x81}), Colour(0)}),
+         "a negative count"},
+        {new GxLinearGradientProperty(45.0f, 1.5f, 1.0f, 2, rampStops), 25,
+         Join({"L", Bytes({0x80, 0xAD, 0x89, 0x86}), Colour(0xFF000000), Bytes({0xB2}), Colour(0xFFFFFFFF),
+               Bytes({0x80 | 100})}),
+         "scale 150 = 0x96 as two nibbles"},
+        {new GxRadialGradientProperty(0.0f, 2.0f, 1.0f, 0, nullptr), 5, Join({"D", Bytes({0x80, 0x80, 0x8C, 0x88})}),
+         "scale 200 = 0xC8"},
+        {new GxBevelProperty(1, 3.5f, 12.34f, 1, 0, 4, 0.8f, 120.0f, 30.0f, 0xFFFFFFFF, 1.0f, 0xFF000000, 1.0f), 30,
+         Join({"B",
+               Bytes({0x81, 0x80, 0x83, 0x80, 0x84, 0x8D, 0x82, 0x81, 0x80, 0x84, 0x80, 0x80 | 120, 0x80 | 30}),
+               Colour(0xFFFFFFFF), Colour(0xFF000000)}),
+         "depth 3 in two nibbles, size 1234 = 0x04D2 in four, 1, 0, 4, angle (0, 120), altitude 30"},
+        {new GxEmbossProperty(3, 0.0f, 0.0f, 0, 1, 0, 1.0f, 0.0f, 0.0f, 0, 0.0f, 0, 0.0f), 30,
+         Join({"E", Bytes({0x83, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0x81, 0x80, 0x80, 0x80, 0x80}), Colour(0),
+               Colour(0)}),
+         "emboss"},
+        {new GxPatternProperty(&tile, 2.5f, 0.5f), 17,
+         Join({"P", Colour(0), Bytes({0x80, 0x80, 0x8F, 0x8A, 0x80, 0x80, 0x83, 0x82})}), "pattern: its opacity"},
+    };
+    for (const auto& c : cases) {
+        const std::unique_ptr<GxProperty> record(c.record);
+        EXPECT_EQ(record->getSequentialCharLength(), c.reserved) << c.why;
+        EXPECT_EQ(Key(*record), c.key) << c.why;
+    }
 }
 
 TEST(PropertyKey, NoKeyByteIsZeroWhateverTheValues) {

@@ -149,6 +149,8 @@ public class FontTest {
                     .failed(false, "no-bytes: no font bytes", none, "no bytes");
             Fixtures.onFreshThread(() -> text.setFont(new AssetManager(dir.toString()), "missing.ttf"))
                     .failed(false, "missing.ttf: no such asset", none, "missing asset");
+            Fixtures.onFreshThread(() -> text.setFont((AssetManager) null, "x.ttf"))
+                    .failed(false, "no asset manager", none, "null assets");
             Fixtures.onFreshThread(() -> text.setFont((String) null))
                     .failed(false, "no font path", none, "null path");
             // A call that works starts without a reason and leaves none.
