@@ -22,20 +22,6 @@ struct FreeOnExit {
     ~FreeOnExit() { std::free(pointer); }
 };
 
-inline bool IsTarget(float v, GxReliefTargets targets) {
-    return targets == GxReliefTargets::kNonZero ? v != 0.0f : v > 0.0f;
-}
-
-// The amount a source contributes before its root is added.
-inline float SourceValue(float v, GxReliefTargets targets) {
-    return targets == GxReliefTargets::kPositive && !(v > 0.0f) ? 0.0f : v;
-}
-
-inline int ClampRadius(int radius, int width, int height) {
-    int largest = width > height ? width : height;
-    return radius > largest ? largest : radius;
-}
-
 }  // namespace
 
 bool ReliefSizePixels(float size, int* pixels) {
@@ -65,6 +51,34 @@ bool ReliefPlanFrame(const GxRect& textRect, int margin, GxReliefFrame* frame) {
     frame->margin = margin;
     frame->pixels = size_t(width) * size_t(height);
     return true;
+}
+
+void ReliefMaskRow(const GxBitmap& mask, int64_t x, int64_t y, int count, unsigned char* out) {
+    // The packed buffer read as one line: indices y * width + x onward.
+    const int64_t total = int64_t(mask.width) * int64_t(mask.height);
+    int64_t begin = y * int64_t(mask.width) + x;
+    int i = 0;
+    if (y < 0 || mask.pixels == nullptr) {
+        std::memset(out, 0, size_t(count > 0 ? count : 0));
+        return;
+    }
+    for (; i < count && (x + i < 0); ++i) out[i] = 0;
+    begin += i;
+    if (i < count && begin < total) {
+        const int64_t n = total - begin < int64_t(count - i) ? total - begin : int64_t(count - i);
+        std::memcpy(out + i, mask.pixels + begin, size_t(n));
+        i += int(n);
+    }
+    for (; i < count; ++i) out[i] = 0;
+}
+
+void* GxReliefBuffer::bytes(size_t n) {
+    if (scratch_ != nullptr) return scratch_->get(slot_, n);
+    if (owned_ != nullptr && n <= ownedBytes_) return owned_;
+    std::free(owned_);
+    owned_ = std::malloc(n ? n : 1);
+    ownedBytes_ = owned_ != nullptr ? n : 0;
+    return owned_;
 }
 
 // ---- blur
@@ -225,171 +239,6 @@ float GxReliefRoots::Slow(int64_t index) {
     return float(std::round(std::sqrt(double(index)) * 1000.0) / 1000.0);
 }
 
-// ---- local distance search
-
-void ReliefLocalDistanceReference(float* field, int width, int height, int radius, int y0, int y1,
-                                  GxReliefTargets targets) {
-    if (field == nullptr || width <= 0 || height <= 0) return;
-    if (y0 < 0) y0 = 0;
-    if (y1 > height) y1 = height;
-    const int r = ClampRadius(radius, width, height);
-    if (y0 >= y1 || r < 0) return;
-    GxReliefRoots roots(ReliefLargestRootIndex(width, height, r));
-    const size_t stride = size_t(width);
-    for (int y = y0; y < y1; ++y) {
-        for (int x = 0; x < width; ++x) {
-            float cur = field[size_t(y) * stride + size_t(x)];
-            if (!IsTarget(cur, targets)) continue;
-            const int yyEnd = y + r + 1 < height ? y + r + 1 : height;
-            const int xxEnd = x + r + 1 < width ? x + r + 1 : width;
-            for (int yy = y - r > 0 ? y - r : 0; yy < yyEnd; ++yy) {
-                for (int xx = x - r > 0 ? x - r : 0; xx < xxEnd; ++xx) {
-                    const float v = field[size_t(yy) * stride + size_t(xx)];
-                    if (!(v < 1.0f)) continue;
-                    const int64_t dy = yy - y;
-                    const int64_t dx = xx - x;
-                    const float root = roots[dy * dy + dx * dx];
-                    const float candidate =
-                        targets == GxReliefTargets::kPositive && !(v > 0.0f) ? root : v + root;
-                    if (candidate < cur) {
-                        cur = candidate;
-                        field[size_t(y) * stride + size_t(x)] = cur;
-                    }
-                }
-            }
-        }
-    }
-}
-
-// The search. Sources (values below 1.0) never change: a candidate is a
-// non-negative amount plus a root of at least 1.0, so no improvement makes a
-// new source, and a source's own window cannot improve it. That allows:
-//   - a summed-area table of source counts, so a window without sources is
-//     passed over at once, and each row's sources are found by column;
-//   - nearest-first search: rows at dy = 0, 1, 2 ... and, in each row, the
-//     sources to the right and to the left of the target outward. Every
-//     candidate is at least the root of its distance (roots grow with the
-//     distance, the added amount is >= 0), so a direction stops as soon as its
-//     root alone is no better than the best found.
-// The minimum found is the minimum the literal scan reaches: equal candidates
-// never replace one another there either.
-int ReliefLocalDistance(float* field, int width, int height, int radius, int y0, int y1,
-                        GxReliefTargets targets) {
-    if (field == nullptr || width <= 0 || height <= 0) return 0;
-    if (y0 < 0) y0 = 0;
-    if (y1 > height) y1 = height;
-    const int r = ClampRadius(radius, width, height);
-    // A window of the pixel alone never improves it.
-    if (y0 >= y1 || r <= 0) return 0;
-
-    const int rowsBegin = y0 - r > 0 ? y0 - r : 0;
-    const int rowsEnd = int64_t(y1) + r < height ? y1 + r : height;
-    const size_t rows = size_t(rowsEnd - rowsBegin);
-    const size_t satStride = size_t(width) + 1;
-    const size_t stride = size_t(width);
-
-    // sat[j][x]: sources in rows [rowsBegin, rowsBegin + j), columns [0, x).
-    auto* sat = static_cast<uint32_t*>(std::calloc((rows + 1) * satStride, sizeof(uint32_t)));
-    FreeOnExit freeSat{sat};
-    if (sat == nullptr) {
-        ReliefLocalDistanceReference(field, width, height, radius, y0, y1, targets);
-        return 0;
-    }
-    for (size_t j = 0; j < rows; ++j) {
-        const float* row = field + (rowsBegin + j) * stride;
-        const uint32_t* above = sat + j * satStride;
-        uint32_t* here = sat + (j + 1) * satStride;
-        uint32_t run = 0;
-        for (int x = 0; x < width; ++x) {
-            const float v = row[x];
-            if (v < 1.0f) {
-                // A negative amount would break the nearest-first bound.
-                if (targets == GxReliefTargets::kNonZero && v < 0.0f) {
-                    ReliefLocalDistanceReference(field, width, height, radius, y0, y1, targets);
-                    return 0;
-                }
-                ++run;
-            }
-            here[x + 1] = above[x + 1] + run;
-        }
-    }
-    const size_t sourceCount = sat[rows * satStride + stride];
-    if (sourceCount == 0) return 0;
-
-    int* columns = static_cast<int*>(std::malloc(sizeof(int) * sourceCount));
-    FreeOnExit freeColumns{columns};
-    float* amounts = static_cast<float*>(std::malloc(sizeof(float) * sourceCount));
-    FreeOnExit freeAmounts{amounts};
-    if (columns == nullptr || amounts == nullptr) {
-        ReliefLocalDistanceReference(field, width, height, radius, y0, y1, targets);
-        return 0;
-    }
-    size_t n = 0;
-    for (size_t j = 0; j < rows; ++j) {
-        const float* row = field + (rowsBegin + j) * stride;
-        for (int x = 0; x < width; ++x) {
-            if (row[x] < 1.0f) {
-                columns[n] = x;
-                amounts[n] = SourceValue(row[x], targets);
-                ++n;
-            }
-        }
-    }
-
-    GxReliefRoots roots(ReliefLargestRootIndex(width, height, r));
-    auto at = [&](int localRow, int x) { return sat[size_t(localRow) * satStride + size_t(x)]; };
-
-    for (int y = y0; y < y1; ++y) {
-        float* out = field + size_t(y) * stride;
-        const int windowTop = (y - r > 0 ? y - r : 0) - rowsBegin;
-        const int windowBottom = (int64_t(y) + r + 1 < height ? y + r + 1 : height) - rowsBegin;
-        for (int x = 0; x < width; ++x) {
-            const float cur = out[x];
-            if (!IsTarget(cur, targets)) continue;
-            const int left = x - r > 0 ? x - r : 0;
-            const int right = int64_t(x) + r + 1 < width ? x + r + 1 : width;
-            const uint32_t inWindow = at(windowBottom, right) - at(windowTop, right) -
-                                      at(windowBottom, left) + at(windowTop, left);
-            if (inWindow == 0) continue;
-
-            float best = cur;
-            const int localY = y - rowsBegin;
-            for (int a = 0; a <= r; ++a) {
-                const int64_t a2 = int64_t(a) * a;
-                if (!(roots[a2] < best)) break;
-                const bool aboveIn = localY - a >= windowTop;
-                const bool belowIn = localY + a < windowBottom;
-                if (!aboveIn && !belowIn) break;
-                for (int side = 0; side < (a == 0 ? 1 : 2); ++side) {
-                    const int j = side == 0 ? localY - a : localY + a;
-                    if (side == 0 ? !aboveIn : !belowIn) continue;
-                    const size_t begin = at(j, width);
-                    const size_t end = at(j + 1, width);
-                    const size_t split = begin + (at(j + 1, x) - at(j, x));
-                    for (size_t k = split; k < end; ++k) {
-                        const int64_t dx = columns[k] - x;
-                        if (dx > r) break;
-                        const float root = roots[a2 + dx * dx];
-                        if (!(root < best)) break;
-                        const float candidate = amounts[k] + root;
-                        if (candidate < best) best = candidate;
-                    }
-                    for (size_t k = split; k-- > begin;) {
-                        const int64_t dx = x - columns[k];
-                        if (dx > r) break;
-                        const float root = roots[a2 + dx * dx];
-                        if (!(root < best)) break;
-                        const float candidate = amounts[k] + root;
-                        if (candidate < best) best = candidate;
-                    }
-                }
-            }
-            out[x] = best;
-        }
-    }
-    return 0;
-}
-
 // ---- light
 
 GxReliefLight ReliefLightVector(float angle, float altitude, int direction) {
@@ -415,60 +264,106 @@ float ReliefIncidence(const GxReliefLight& light, float normalZ, float gx, float
 
 // ---- colouring
 
+GxReliefPalette::GxReliefPalette(float gain, uint32_t firstColour, uint32_t secondColour) {
+    for (int i = 0; i < 256; ++i) {
+        tone[i] = int(gain * float(i));  // ReliefTone's product, once per byte
+        firstTint[i] = ReliefTint(firstColour, i);
+        secondTint[i] = ReliefTint(secondColour, i);
+    }
+}
+
 void ReliefColourise(const unsigned char* first, const unsigned char* second, size_t count,
                      float gain, uint32_t firstColour, uint32_t secondColour, uint32_t* out) {
+    const GxReliefPalette palette(gain, firstColour, secondColour);
     for (size_t i = 0; i < count; ++i) {
-        const GxReliefTone tone = ReliefTone(first[i], second[i], gain);
-        const int alpha = tone.difference > 255 ? 255 : tone.difference;
-        out[i] = ReliefTint(tone.first ? firstColour : secondColour, alpha);
+        const int d = palette.tone[first[i]] - palette.tone[second[i]];
+        out[i] = d > 0 ? palette.firstTint[d > 255 ? 255 : d] : palette.secondTint[-d > 255 ? 255 : -d];
     }
 }
 
 // ---- planes
 
 GxReliefPlanes::~GxReliefPlanes() {
-    std::free(second);
-    std::free(first);
+    for (unsigned char* block : owned_) std::free(block);
+}
+
+unsigned char* GxReliefPlanes::Own(size_t pixels, bool zeroed) {
+    for (unsigned char*& block : owned_) {
+        if (block != nullptr) continue;
+        block = static_cast<unsigned char*>(zeroed ? std::calloc(pixels ? pixels : 1, 1)
+                                                   : std::malloc(pixels ? pixels : 1));
+        return block;
+    }
+    return nullptr;
 }
 
 bool GxReliefPlanes::Allocate(size_t pixels) {
-    second = static_cast<unsigned char*>(std::calloc(pixels, 1));
-    first = static_cast<unsigned char*>(std::calloc(pixels, 1));
+    second = Own(pixels, true);
+    first = Own(pixels, true);
     return second != nullptr && first != nullptr;
 }
 
+void GxReliefPlanes::Use(unsigned char* secondPlane, unsigned char* firstPlane, unsigned char* sparePlane) {
+    second = secondPlane;
+    first = firstPlane;
+    spare = sparePlane;
+}
+
+namespace {
+
+// Zeroes what a blur of `radius` does not write (see ReliefBlur), so the
+// plane reads as a fresh zeroed one once the blur has run.
+void ZeroOutsideBlur(unsigned char* plane, int width, int height, int radius) {
+    const size_t w = size_t(width);
+    if (width - 2 * int64_t(radius) <= 0 || height - 2 * int64_t(radius) <= 0) {
+        std::memset(plane, 0, w * size_t(height));
+        return;
+    }
+    const size_t r = size_t(radius);
+    std::memset(plane, 0, r * w);
+    std::memset(plane + (size_t(height) - r) * w, 0, r * w);
+    for (size_t y = r; y < size_t(height) - r; ++y) {
+        std::memset(plane + y * w, 0, r);
+        std::memset(plane + y * w + w - r, 0, r);
+    }
+}
+
+}  // namespace
+
 bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, bool smooth,
-                           int smoothRadius, int soften) {
+                           int smoothRadius, int soften, GxScratch* scratch) {
     const size_t pixels = size_t(width) * size_t(height);
-    unsigned char* scratch = nullptr;
+    auto spare = [&]() {
+        if (planes->spare == nullptr) planes->spare = planes->Own(pixels, false);
+        return planes->spare;
+    };
+    bool smoothed = false;
     if (smooth) {
         if (smoothRadius < 0) return false;  // its region would leave the planes
-        auto* third = static_cast<unsigned char*>(std::calloc(pixels, 1));
+        unsigned char* third = spare();
         if (third == nullptr) return false;
-        bool ok = ReliefBlur(planes->second, third, width, smoothRadius, height) == 0 &&
-                  ReliefBlur(planes->first, planes->second, width, smoothRadius, height) == 0;
-        scratch = planes->first;  // still the unblurred first wash
+        ZeroOutsideBlur(third, width, height, smoothRadius);
+        const bool ok = ReliefBlur(planes->second, third, width, smoothRadius, height, scratch) == 0 &&
+                        ReliefBlur(planes->first, planes->second, width, smoothRadius, height, scratch) == 0;
+        planes->spare = planes->first;  // still the unblurred first wash
         planes->first = planes->second;
         planes->second = third;
-        if (!ok) {
-            std::free(scratch);
-            return false;
-        }
+        if (!ok) return false;
+        smoothed = true;
     }
     if (soften >= 1) {
-        if (scratch == nullptr) {
-            scratch = static_cast<unsigned char*>(std::calloc(pixels, 1));
-            if (scratch == nullptr) return false;
-        }
-        bool ok = ReliefBlur(planes->second, scratch, width, soften, height) == 0 &&
-                  ReliefBlur(planes->first, planes->second, width, soften, height) == 0;
-        unsigned char* spent = planes->first;
+        // After smoothing the spare keeps the unblurred first wash, outer strips
+        // included; without, it stands for a fresh zeroed plane.
+        unsigned char* target = spare();
+        if (target == nullptr) return false;
+        if (!smoothed) ZeroOutsideBlur(target, width, height, soften);
+        const bool ok = ReliefBlur(planes->second, target, width, soften, height, scratch) == 0 &&
+                        ReliefBlur(planes->first, planes->second, width, soften, height, scratch) == 0;
+        planes->spare = planes->first;
         planes->first = planes->second;
-        planes->second = scratch;
-        std::free(spent);
+        planes->second = target;
         return ok;
     }
-    std::free(scratch);
     return true;
 }
 

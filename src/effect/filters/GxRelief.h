@@ -39,6 +39,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstdlib>
 #include <new>
 
 #include "effect/GxECoreBase.h"
@@ -105,6 +106,35 @@ inline unsigned ReliefMaskAt(const GxBitmap& mask, int64_t x, int64_t y) {
     return mask.pixels[index];
 }
 
+// The mask bytes at (x, y) .. (x + count - 1, y) as ReliefMaskAt reads them,
+// into out.
+void ReliefMaskRow(const GxBitmap& mask, int64_t x, int64_t y, int count, unsigned char* out);
+
+// Memory for one render: a slot of the stack's scratch when there is one
+// (nothing allocated once the slot has grown), else the heap, freed with the
+// buffer. Each get() may replace what an earlier one returned.
+class GxReliefBuffer {
+public:
+    GxReliefBuffer(GxScratch* scratch, GxScratch::Slot slot) : scratch_(scratch), slot_(slot) {}
+    ~GxReliefBuffer() { std::free(owned_); }
+    GxReliefBuffer(const GxReliefBuffer&) = delete;
+    GxReliefBuffer& operator=(const GxReliefBuffer&) = delete;
+
+    // count T, or null when they cannot be had.
+    template <typename T>
+    T* get(size_t count) {
+        if (count > (SIZE_MAX - 64) / sizeof(T)) return nullptr;
+        return static_cast<T*>(bytes(count * sizeof(T)));
+    }
+
+private:
+    void* bytes(size_t n);
+    GxScratch* scratch_;
+    GxScratch::Slot slot_;
+    void* owned_ = nullptr;
+    size_t ownedBytes_ = 0;
+};
+
 // ---- blur
 
 // Blur job: a rectangle [x0, x1) x [y0, y1) of byte planes `stride` bytes
@@ -143,15 +173,25 @@ enum class GxReliefTargets {
     kPositive,  // emboss outward pass: values above 0; candidate max(v, 0) + root
 };
 
-// Rows [y0, y1) of a width x height field, window radius `radius`.
-// Returns 0 (every outcome).
+// The local search over rows [y0, y1) of a width x height field, window
+// radius `radius` (GxReliefSearch.cpp tells how). With `scratch` its tables
+// come from the kRows slot. Returns 0 (every outcome).
 int ReliefLocalDistance(float* field, int width, int height, int radius, int y0, int y1,
-                        GxReliefTargets targets);
+                        GxReliefTargets targets, GxScratch* scratch = nullptr);
 // The literal scan, rows outer and columns inner in increasing order, each
-// improvement stored at once. The fast search above falls back to it when
-// its scratch cannot be had (or, for kNonZero, when a source is negative).
+// improvement stored at once: what the search above must give. It also
+// serves it where its shortcuts do not hold (a negative source for kNonZero).
 void ReliefLocalDistanceReference(float* field, int width, int height, int radius, int y0, int y1,
                                   GxReliefTargets targets);
+
+// The emboss's inward pass over rows [y0, y1): every pixel below 0 takes the
+// largest v - sqrt(dx^2 + dy^2) over the pixels above 1.0 in its window of
+// `radius` (radius clamped to the larger side; negative: nothing). With
+// `scratch` its planes and tables come from the kPlaneC and kRows slots.
+void ReliefInwardDistance(float* field, int width, int height, int radius, int y0, int y1,
+                          GxScratch* scratch = nullptr);
+// Its literal scan, rows outer and columns inner, each improvement stored at once.
+void ReliefInwardDistanceReference(float* field, int width, int height, int radius, int y0, int y1);
 
 // sqrt(i) as the rounded table holds it, for every index a window can reach
 // (beyond the stored table too). Falls back to IntSqrt when a longer table
@@ -256,6 +296,15 @@ inline GxReliefTone ReliefTone(unsigned firstValue, unsigned secondValue, float 
     return {d < 0 ? -d : d, s > l};
 }
 
+// The colouring tabulated: tone[b] = int(gain * b) for every plane byte, and
+// each colour premultiplied by every alpha (ReliefTint).
+struct GxReliefPalette {
+    GxReliefPalette(float gain, uint32_t firstColour, uint32_t secondColour);
+    int tone[256];
+    uint32_t firstTint[256];
+    uint32_t secondTint[256];
+};
+
 // One pixel per plane byte: min(|s - l|, 255) in the winning colour,
 // premultiplied, as 0xAARRGGBB words.
 void ReliefColourise(const unsigned char* first, const unsigned char* second, size_t count,
@@ -263,34 +312,49 @@ void ReliefColourise(const unsigned char* first, const unsigned char* second, si
 
 // ---- planes
 
-// The two wash planes of one lighting, frame-sized, owned (freed on
-// destruction). Which buffer holds which wash changes as the blurs rotate them.
+// The two wash planes of one lighting and the blurs' spare buffer, frame-
+// sized. Which buffer holds which wash changes as the blurs rotate them.
 struct GxReliefPlanes {
     GxReliefPlanes() = default;
     ~GxReliefPlanes();
     GxReliefPlanes(const GxReliefPlanes&) = delete;
     GxReliefPlanes& operator=(const GxReliefPlanes&) = delete;
 
-    // Both planes zeroed; false when either could not be had.
+    // Both planes zeroed, owned (freed on destruction); false when either
+    // could not be had.
     bool Allocate(size_t pixels);
+    // The caller's buffers, contents as they are; `spare` may be null.
+    void Use(unsigned char* secondPlane, unsigned char* firstPlane, unsigned char* sparePlane);
+    // A block freed on destruction (at most three), or null.
+    unsigned char* Own(size_t pixels, bool zeroed);
 
     unsigned char* second = nullptr;
     unsigned char* first = nullptr;
+    // What the blurs write into besides the planes; taken from the heap when
+    // null. Holds no wash the caller needs.
+    unsigned char* spare = nullptr;
+
+private:
+    unsigned char* owned_[3] = {};
 };
 
 // Smoothing (when `smooth`: the smooth technique, whatever its radius; a
 // radius of 0 copies), then softening (soften >= 1), of both planes
 // of a width x height frame:
 //   smoothing: a fresh zeroed plane P; blur second -> P, first -> second's
-//     buffer; then second = P, first = old second buffer, scratch = old first
+//     buffer; then second = P, first = old second buffer, spare = old first
 //     buffer (still holding the unblurred first wash).
-//   softening: scratch (or, without smoothing, a fresh zeroed plane); blur
-//     second -> scratch, first -> second's buffer; then second = scratch,
-//     first = second's buffer; the remaining buffer is freed.
+//   softening: the spare after smoothing (as it is), else a fresh zeroed
+//     plane S; blur second -> S, first -> second's buffer; then second = S,
+//     first = second's buffer, spare = the remaining buffer.
+// A blur writes only its inner region, so the outer strips show which buffer
+// went where; that is the layers' established output. A "fresh zeroed" plane
+// is the spare with the strips the blur leaves alone zeroed. With `scratch`
+// the blurs' row buffer comes from its kRows slot.
 // false when a plane or a blur's scratch could not be had, or the smoothing
 // radius is negative (planes then hold an unspecified but valid state).
 bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, bool smooth,
-                           int smoothRadius, int soften);
+                           int smoothRadius, int soften, GxScratch* scratch = nullptr);
 
 // ---- drawing
 

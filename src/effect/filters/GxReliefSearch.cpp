@@ -1,0 +1,423 @@
+// Local distance searches of the relief layers
+//
+// The smaller bevels and every hard or small emboss build their height field
+// by local searches instead of a distance transform. Both are defined by a
+// literal scan, kept below as the reference: pixels in rows, then columns,
+// each looking at every pixel of its square window and keeping an
+// improvement at once.
+//
+// Outward search (bevel; emboss outward pass). A target (any value but 0,
+// or above 0) takes the smallest A(q) + R(dx^2 + dy^2) over the sources q of
+// its window, the pixels below 1.0, where A(q) is the source's value (or 0
+// for a non-positive one in the emboss) and R the rounded square-root table.
+// What makes it fast, each step exact:
+//   - Sources never change, so no order matters. A candidate is A >= 0 plus a
+//     root of at least 1.0 for any other pixel, so an improvement is never
+//     below 1.0 (no new source), and a target below 1.0 cannot improve.
+//     A negative source would break that (kNonZero only): the literal runs.
+//   - Scatter instead of gather: each source sweeps its candidates over the
+//     pixels around it and every pixel keeps the smallest. The minimum is
+//     the literal's minimum; equal candidates have equal values.
+//   - Only a disc. A source farther than the radius gives a candidate of at
+//     least R(r^2 + 1) >= r, never below a target's value when that value is
+//     at most R(r^2 + 1), which every field the layers build satisfies (their
+//     far value is the radius). Other targets (hand-made fields) take the
+//     literal window scan first.
+//   - Only the outline. A source whose four neighbours are all sources with
+//     an amount no larger (or outside the field) is never the best: for any
+//     pixel, the neighbour on its side is nearer, as near in both
+//     coordinates, so inside the same window, and no dearer. Glyph interiors
+//     sweep nothing; the work is proportional to outline x radius^2 / lanes.
+//   - Each swept row is one vector compare-and-select (GxReliefRows).
+//   Beyond kSweepRadius the disc tables grow too large and the older
+//   nearest-first gather serves (a summed-area table skips empty windows,
+//   rows and then columns are visited outward until a root alone is no
+//   better than the best found).
+//
+// Inward search (emboss, after the outward pass). A target (below 0) takes
+// the largest v - R(dx^2 + dy^2) over the pixels above 1.0 in its window.
+// No pruning bound helps here (the best candidate comes from near the edge
+// and the largest values are far from it), so the window is gathered in
+// full, but on a vector of targets at once from a plane where non-sources
+// read -infinity, and only for vectors holding a target. An improvement
+// above 1.0 would make a new source for the pixels after it: from there on
+// the literal scan continues (no field the emboss builds gets there).
+
+#include <cmath>
+#include <cstdlib>
+#include <cstring>
+#include <limits>
+
+#include "effect/filters/GxRelief.h"
+#include "effect/filters/GxReliefRows.h"
+
+namespace Glimmer {
+namespace {
+
+// Largest radius swept by discs (their tables are (r + 1) x (2r + 1) floats).
+constexpr int kSweepRadius = 128;
+// Largest inward window gathered by vectors ((2r + 1)^2 roots).
+constexpr int kInwardRadius = 128;
+// Vector lanes the inward plane is padded for (AVX-512 floats).
+constexpr int kLanePadding = 16;
+
+struct FreeOnExit {
+    void* pointer;
+    ~FreeOnExit() { std::free(pointer); }
+};
+
+inline bool IsTarget(float v, GxReliefTargets targets) {
+    return targets == GxReliefTargets::kNonZero ? v != 0.0f : v > 0.0f;
+}
+
+// The amount a source contributes before its root is added.
+inline float SourceValue(float v, GxReliefTargets targets) {
+    return targets == GxReliefTargets::kPositive && !(v > 0.0f) ? 0.0f : v;
+}
+
+inline int ClampRadius(int radius, int width, int height) {
+    int largest = width > height ? width : height;
+    return radius > largest ? largest : radius;
+}
+
+// The literal scan of one target at (x, y), as ReliefLocalDistanceReference
+// runs it.
+void OutwardPixel(float* field, int width, int height, int r, int x, int y, GxReliefTargets targets,
+                  const GxReliefRoots& roots) {
+    const size_t stride = size_t(width);
+    float cur = field[size_t(y) * stride + size_t(x)];
+    const int yyEnd = y + r + 1 < height ? y + r + 1 : height;
+    const int xxEnd = x + r + 1 < width ? x + r + 1 : width;
+    for (int yy = y - r > 0 ? y - r : 0; yy < yyEnd; ++yy) {
+        for (int xx = x - r > 0 ? x - r : 0; xx < xxEnd; ++xx) {
+            const float v = field[size_t(yy) * stride + size_t(xx)];
+            if (!(v < 1.0f)) continue;
+            const int64_t dy = yy - y;
+            const int64_t dx = xx - x;
+            const float root = roots[dy * dy + dx * dx];
+            const float candidate = targets == GxReliefTargets::kPositive && !(v > 0.0f) ? root : v + root;
+            if (candidate < cur) {
+                cur = candidate;
+                field[size_t(y) * stride + size_t(x)] = cur;
+            }
+        }
+    }
+}
+
+// The literal inward scan of one target at (x, y).
+void InwardPixel(float* field, int width, int height, int r, int x, int y, const GxReliefRoots& roots) {
+    const size_t stride = size_t(width);
+    float cur = field[size_t(y) * stride + size_t(x)];
+    if (!(cur < 0.0f)) return;
+    const int yyEnd = y + r + 1 < height ? y + r + 1 : height;
+    const int xxEnd = x + r + 1 < width ? x + r + 1 : width;
+    for (int yy = y - r > 0 ? y - r : 0; yy < yyEnd; ++yy) {
+        const float* row = field + size_t(yy) * stride;
+        const int64_t dy2 = int64_t(yy - y) * (yy - y);
+        for (int xx = x - r > 0 ? x - r : 0; xx < xxEnd; ++xx) {
+            const float v = row[xx];
+            if (!(v > 1.0f)) continue;
+            const float candidate = v - roots[dy2 + int64_t(xx - x) * (xx - x)];
+            if (cur < candidate) {
+                cur = candidate;
+                field[size_t(y) * stride + size_t(x)] = cur;
+            }
+        }
+    }
+}
+
+// The inward literal from pixel (x, y) to the end of row y1 - 1.
+void InwardLiteralFrom(float* field, int width, int height, int r, int x, int y, int y1,
+                       const GxReliefRoots& roots) {
+    for (; y < y1; ++y, x = 0)
+        for (; x < width; ++x) InwardPixel(field, width, height, r, x, y, roots);
+}
+
+// The nearest-first gather, for radii past kSweepRadius (see the top).
+void NearestFirst(float* field, int width, int height, int r, int y0, int y1, GxReliefTargets targets) {
+    const int rowsBegin = y0 - r > 0 ? y0 - r : 0;
+    const int rowsEnd = int64_t(y1) + r < height ? y1 + r : height;
+    const size_t rows = size_t(rowsEnd - rowsBegin);
+    const size_t satStride = size_t(width) + 1;
+    const size_t stride = size_t(width);
+
+    // sat[j][x]: sources in rows [rowsBegin, rowsBegin + j), columns [0, x).
+    auto* sat = static_cast<uint32_t*>(std::calloc((rows + 1) * satStride, sizeof(uint32_t)));
+    FreeOnExit freeSat{sat};
+    if (sat == nullptr) {
+        ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+        return;
+    }
+    for (size_t j = 0; j < rows; ++j) {
+        const float* row = field + (rowsBegin + j) * stride;
+        const uint32_t* above = sat + j * satStride;
+        uint32_t* here = sat + (j + 1) * satStride;
+        uint32_t run = 0;
+        for (int x = 0; x < width; ++x) {
+            if (row[x] < 1.0f) ++run;
+            here[x + 1] = above[x + 1] + run;
+        }
+    }
+    const size_t sourceCount = sat[rows * satStride + stride];
+    if (sourceCount == 0) return;
+
+    int* columns = static_cast<int*>(std::malloc(sizeof(int) * sourceCount));
+    FreeOnExit freeColumns{columns};
+    float* amounts = static_cast<float*>(std::malloc(sizeof(float) * sourceCount));
+    FreeOnExit freeAmounts{amounts};
+    if (columns == nullptr || amounts == nullptr) {
+        ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+        return;
+    }
+    size_t n = 0;
+    for (size_t j = 0; j < rows; ++j) {
+        const float* row = field + (rowsBegin + j) * stride;
+        for (int x = 0; x < width; ++x) {
+            if (row[x] < 1.0f) {
+                columns[n] = x;
+                amounts[n] = SourceValue(row[x], targets);
+                ++n;
+            }
+        }
+    }
+
+    GxReliefRoots roots(ReliefLargestRootIndex(width, height, r));
+    auto at = [&](int localRow, int x) { return sat[size_t(localRow) * satStride + size_t(x)]; };
+
+    for (int y = y0; y < y1; ++y) {
+        float* out = field + size_t(y) * stride;
+        const int windowTop = (y - r > 0 ? y - r : 0) - rowsBegin;
+        const int windowBottom = (int64_t(y) + r + 1 < height ? y + r + 1 : height) - rowsBegin;
+        for (int x = 0; x < width; ++x) {
+            const float cur = out[x];
+            if (!IsTarget(cur, targets)) continue;
+            const int left = x - r > 0 ? x - r : 0;
+            const int right = int64_t(x) + r + 1 < width ? x + r + 1 : width;
+            const uint32_t inWindow = at(windowBottom, right) - at(windowTop, right) -
+                                      at(windowBottom, left) + at(windowTop, left);
+            if (inWindow == 0) continue;
+
+            // Every candidate is at least the root of its distance (roots grow
+            // with the distance, the amount is >= 0): a direction stops as soon
+            // as its root alone is no better than the best found.
+            float best = cur;
+            const int localY = y - rowsBegin;
+            for (int a = 0; a <= r; ++a) {
+                const int64_t a2 = int64_t(a) * a;
+                if (!(roots[a2] < best)) break;
+                const bool aboveIn = localY - a >= windowTop;
+                const bool belowIn = localY + a < windowBottom;
+                if (!aboveIn && !belowIn) break;
+                for (int side = 0; side < (a == 0 ? 1 : 2); ++side) {
+                    const int j = side == 0 ? localY - a : localY + a;
+                    if (side == 0 ? !aboveIn : !belowIn) continue;
+                    const size_t begin = at(j, width);
+                    const size_t end = at(j + 1, width);
+                    const size_t split = begin + (at(j + 1, x) - at(j, x));
+                    for (size_t k = split; k < end; ++k) {
+                        const int64_t dx = columns[k] - x;
+                        if (dx > r) break;
+                        const float root = roots[a2 + dx * dx];
+                        if (!(root < best)) break;
+                        const float candidate = amounts[k] + root;
+                        if (candidate < best) best = candidate;
+                    }
+                    for (size_t k = split; k-- > begin;) {
+                        const int64_t dx = x - columns[k];
+                        if (dx > r) break;
+                        const float root = roots[a2 + dx * dx];
+                        if (!(root < best)) break;
+                        const float candidate = amounts[k] + root;
+                        if (candidate < best) best = candidate;
+                    }
+                }
+            }
+            out[x] = best;
+        }
+    }
+}
+
+}  // namespace
+
+// ---- outward
+
+void ReliefLocalDistanceReference(float* field, int width, int height, int radius, int y0, int y1,
+                                  GxReliefTargets targets) {
+    if (field == nullptr || width <= 0 || height <= 0) return;
+    if (y0 < 0) y0 = 0;
+    if (y1 > height) y1 = height;
+    const int r = ClampRadius(radius, width, height);
+    if (y0 >= y1 || r < 0) return;
+    GxReliefRoots roots(ReliefLargestRootIndex(width, height, r));
+    for (int y = y0; y < y1; ++y)
+        for (int x = 0; x < width; ++x)
+            if (IsTarget(field[size_t(y) * size_t(width) + size_t(x)], targets))
+                OutwardPixel(field, width, height, r, x, y, targets, roots);
+}
+
+int ReliefLocalDistance(float* field, int width, int height, int radius, int y0, int y1, GxReliefTargets targets,
+                        GxScratch* scratch) {
+    if (field == nullptr || width <= 0 || height <= 0) return 0;
+    if (y0 < 0) y0 = 0;
+    if (y1 > height) y1 = height;
+    const int r = ClampRadius(radius, width, height);
+    // A window of the pixel alone never improves it.
+    if (y0 >= y1 || r <= 0) return 0;
+    const int rowsBegin = y0 - r > 0 ? y0 - r : 0;
+    const int rowsEnd = int64_t(y1) + r < height ? y1 + r : height;
+    const size_t stride = size_t(width);
+    if (targets == GxReliefTargets::kNonZero) {
+        for (size_t i = size_t(rowsBegin) * stride; i < size_t(rowsEnd) * stride; ++i) {
+            if (field[i] < 0.0f) {
+                ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+                return 0;
+            }
+        }
+    }
+    if (r > kSweepRadius) {
+        NearestFirst(field, width, height, r, y0, y1, targets);
+        return 0;
+    }
+
+    // The disc: chords[a] = the largest c with a^2 + c^2 <= r^2, and the roots
+    // of every offset inside it, row by row.
+    const size_t rows = size_t(r) + 1;
+    const size_t rootCount = rows * size_t(2 * r + 1);
+    GxReliefBuffer tables(scratch, GxScratch::kRows);
+    auto* memory = tables.get<unsigned char>(rows * (sizeof(const float*) + sizeof(int)) + rootCount * sizeof(float));
+    if (memory == nullptr) {
+        ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+        return 0;
+    }
+    auto** rootRows = reinterpret_cast<const float**>(memory);
+    auto* chords = reinterpret_cast<int*>(memory + rows * sizeof(const float*));
+    auto* rootValues = reinterpret_cast<float*>(memory + rows * (sizeof(const float*) + sizeof(int)));
+    GxReliefRoots roots(int64_t(r) * r + 1);
+    float* next = rootValues;
+    int chord = r;
+    for (int a = 0; a <= r; ++a) {
+        const int64_t a2 = int64_t(a) * a;
+        while (a2 + int64_t(chord) * chord > int64_t(r) * r) --chord;
+        chords[a] = chord;
+        rootRows[a] = next + chord;
+        for (int dx = -chord; dx <= chord; ++dx) *next++ = roots[a2 + int64_t(dx) * dx];
+    }
+    const ReliefRows::Disc disc{chords, rootRows};
+
+    // Targets above R(r^2 + 1): the literal window first (see the top).
+    const float bound = roots[int64_t(r) * r + 1];
+    GxReliefRoots* windowRoots = nullptr;
+    for (int y = y0; y < y1; ++y) {
+        const float* row = field + size_t(y) * stride;
+        for (int x = 0; x < width; ++x) {
+            if (!(IsTarget(row[x], targets) && row[x] > bound)) continue;
+            if (windowRoots == nullptr) {
+                windowRoots = new (std::nothrow) GxReliefRoots(ReliefLargestRootIndex(width, height, r));
+                if (windowRoots == nullptr) {
+                    ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+                    return 0;
+                }
+            }
+            OutwardPixel(field, width, height, r, x, y, targets, *windowRoots);
+        }
+    }
+    delete windowRoots;
+
+    // Every source not dominated by its four neighbours sweeps its disc.
+    const ReliefRows::SweepSource sweep = ReliefRows::Active().sweepSource;
+    for (int j = rowsBegin; j < rowsEnd; ++j) {
+        const float* row = field + size_t(j) * stride;
+        const float* above = j > 0 ? row - stride : nullptr;
+        const float* below = j + 1 < height ? row + stride : nullptr;
+        for (int x = 0; x < width; ++x) {
+            const float v = row[x];
+            if (!(v < 1.0f)) continue;
+            const float amount = SourceValue(v, targets);
+            auto covers = [&](const float* line, int at) {
+                if (line == nullptr || at < 0 || at >= width) return true;
+                return line[at] < 1.0f && SourceValue(line[at], targets) <= amount;
+            };
+            if (covers(row, x - 1) && covers(row, x + 1) && covers(above, x) && covers(below, x)) continue;
+            const int begin = j - r > y0 ? j - r : y0;
+            const int end = int64_t(j) + r + 1 < y1 ? j + r + 1 : y1;
+            if (begin < end) sweep(field, ptrdiff_t(stride), width, x, j, begin, end, disc, amount);
+        }
+    }
+    return 0;
+}
+
+// ---- inward
+
+void ReliefInwardDistanceReference(float* field, int width, int height, int radius, int y0, int y1) {
+    if (field == nullptr || width <= 0 || height <= 0) return;
+    const int r = ClampRadius(radius, width, height);
+    if (y0 < 0) y0 = 0;
+    if (y1 > height) y1 = height;
+    if (r < 0) return;
+    GxReliefRoots roots(ReliefLargestRootIndex(width, height, r));
+    InwardLiteralFrom(field, width, height, r, 0, y0, y1, roots);
+}
+
+void ReliefInwardDistance(float* field, int width, int height, int radius, int y0, int y1, GxScratch* scratch) {
+    if (field == nullptr || width <= 0 || height <= 0) return;
+    const int r = ClampRadius(radius, width, height);
+    if (y0 < 0) y0 = 0;
+    if (y1 > height) y1 = height;
+    // The window of a pixel alone holds no source: a target is below 0.
+    if (r <= 0 || y0 >= y1) return;
+    if (r > kInwardRadius) {
+        ReliefInwardDistanceReference(field, width, height, r, y0, y1);
+        return;
+    }
+    const int rowsBegin = y0 - r > 0 ? y0 - r : 0;
+    const int rowsEnd = int64_t(y1) + r < height ? y1 + r : height;
+    const size_t stride = size_t(width);
+
+    // The sources with r columns of -infinity on either side (and lanes'
+    // worth more on the right), rows [rowsBegin, rowsEnd).
+    const size_t planeStride = stride + 2 * size_t(r) + kLanePadding;
+    const size_t planeFloats = size_t(rowsEnd - rowsBegin) * planeStride;
+    const size_t side = size_t(2 * r + 1);
+    GxReliefBuffer planeMemory(scratch, GxScratch::kPlaneC);
+    GxReliefBuffer rowMemory(scratch, GxScratch::kRows);
+    float* plane = planeMemory.get<float>(planeFloats);
+    float* windowRoots = rowMemory.get<float>(side * side + stride);
+    if (plane == nullptr || windowRoots == nullptr) {
+        ReliefInwardDistanceReference(field, width, height, r, y0, y1);
+        return;
+    }
+    float* out = windowRoots + side * side;
+    const float none = -std::numeric_limits<float>::infinity();
+    for (int j = rowsBegin; j < rowsEnd; ++j) {
+        const float* row = field + size_t(j) * stride;
+        float* p = plane + size_t(j - rowsBegin) * planeStride;
+        for (size_t i = 0; i < size_t(r); ++i) p[i] = none;
+        for (size_t x = 0; x < stride; ++x) p[r + x] = row[x] > 1.0f ? row[x] : none;
+        for (size_t i = size_t(r) + stride; i < planeStride; ++i) p[i] = none;
+    }
+    GxReliefRoots roots(2 * int64_t(r) * r);
+    for (int a = -r; a <= r; ++a)
+        for (int dx = -r; dx <= r; ++dx)
+            windowRoots[size_t(a + r) * side + size_t(dx + r)] = roots[int64_t(a) * a + int64_t(dx) * dx];
+
+    const ReliefRows::InwardRow inwardRow = ReliefRows::Active().inwardRow;
+    for (int y = y0; y < y1; ++y) {
+        float* row = field + size_t(y) * stride;
+        const int above = y - r > 0 ? r : y;
+        const int below = int64_t(y) + r < height ? r : height - 1 - y;
+        const float* centre = plane + size_t(y - rowsBegin) * planeStride + size_t(r);
+        inwardRow(centre, ptrdiff_t(planeStride), above, below, r, windowRoots, row, out, width);
+        for (int x = 0; x < width; ++x) {
+            if (!(row[x] < 0.0f)) continue;
+            row[x] = out[x];
+            if (out[x] > 1.0f) {
+                // A new source for the pixels after this one.
+                GxReliefRoots literalRoots(ReliefLargestRootIndex(width, height, r));
+                InwardLiteralFrom(field, width, height, r, x + 1, y, y1, literalRoots);
+                return;
+            }
+        }
+    }
+}
+
+}  // namespace Glimmer
