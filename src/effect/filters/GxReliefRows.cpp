@@ -10,7 +10,9 @@
 // keeps its byte: it is loaded and selected back.
 //
 // The searches: the sweep is one compare-and-select per column of the
-// source's disc, the inward row one subtraction and compare-and-select per
+// source's disc (a span shorter than a vector takes a narrower one, and the
+// last vector may overlap the one before it: taking a minimum twice changes
+// nothing), the inward row one subtraction and compare-and-select per
 // window offset, on whole vectors of columns at once. Columns past the last
 // whole vector take the scalar form, as does everything in the one-lane
 // fallback build.
@@ -100,11 +102,13 @@ struct Span {
     int begin, end;
     const float* roots;
 };
-inline Span SweepSpanOf(int width, int x, int sourceRow, int y, const Disc& disc) {
+inline Span SweepSpanOf(int width, int x, int sourceRow, int y, bool left, bool right, const Disc& disc) {
     const int a = y > sourceRow ? y - sourceRow : sourceRow - y;
     const int chord = disc.chords[a];
-    const int begin = x - chord > 0 ? x - chord : 0;
-    const int end = x + chord + 1 < width ? x + chord + 1 : width;
+    const int from = left ? x - chord : x;
+    const int to = right ? x + chord + 1 : x + 1;
+    const int begin = from > 0 ? from : 0;
+    const int end = to < width ? to : width;
     return {begin, end, disc.roots[a] + (begin - x)};
 }
 
@@ -277,24 +281,44 @@ void EmbossSoftLight(const float* HWY_RESTRICT o, const float* HWY_RESTRICT in, 
     for (; x < n; ++x) Scalar::EmbossSoftPixel(o + x, in + x, stride, l, second + x, first + x);
 }
 
+#if HWY_TARGET != HWY_SCALAR
+// The span in vectors of D: whole ones, then one more ending at the span's
+// end, overlapping the last (a minimum taken twice is the same minimum).
+// false when the span is shorter than one vector.
+template <class D>
+HWY_INLINE bool SweepVectors(D d, float* HWY_RESTRICT out, const float* HWY_RESTRICT roots, int n, float amount) {
+    const int N = int(hn::Lanes(d));
+    if (n < N) return false;
+    const auto a = hn::Set(d, amount);
+    auto one = [&](int i) {
+        const auto candidate = hn::Add(a, hn::LoadU(d, roots + i));
+        const auto value = hn::LoadU(d, out + i);
+        hn::StoreU(hn::IfThenElse(hn::Lt(candidate, value), candidate, value), d, out + i);
+    };
+    int i = 0;
+    for (; i + N <= n; i += N) one(i);
+    if (i < n) one(n - N);
+    return true;
+}
+#endif
+
 void SweepSource(float* HWY_RESTRICT field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin,
-                 int rowEnd, const Disc& disc, float amount) {
+                 int rowEnd, bool left, bool right, const Disc& disc, float amount) {
     for (int y = rowBegin; y < rowEnd; ++y) {
-        const Scalar::Span span = Scalar::SweepSpanOf(width, x, sourceRow, y, disc);
+        const Scalar::Span span = Scalar::SweepSpanOf(width, x, sourceRow, y, left, right, disc);
         float* out = field + ptrdiff_t(y) * stride + span.begin;
         const int n = span.end - span.begin;
-        int i = 0;
 #if HWY_TARGET != HWY_SCALAR
-        const DF df;
-        const int N = int(hn::Lanes(df));
-        const VF a = hn::Set(df, amount);
-        for (; i + N <= n; i += N) {
-            const VF candidate = hn::Add(a, hn::LoadU(df, span.roots + i));
-            const VF value = hn::LoadU(df, out + i);
-            hn::StoreU(hn::IfThenElse(hn::Lt(candidate, value), candidate, value), df, out + i);
+        // Short spans (the discs' ends, one-sided sweeps) take narrower vectors.
+        const hn::ScalableTag<float> full;
+        const hn::CappedTag<float, 8> eight;
+        const hn::CappedTag<float, 4> four;
+        if (SweepVectors(full, out, span.roots, n, amount) || SweepVectors(eight, out, span.roots, n, amount) ||
+            SweepVectors(four, out, span.roots, n, amount)) {
+            continue;
         }
 #endif
-        if (i < n) Scalar::SweepSpan(out + i, span.roots + i, n - i, amount);
+        Scalar::SweepSpan(out, span.roots, n, amount);
     }
 }
 
@@ -353,9 +377,9 @@ void EmbossSoftLight(const float* o, const float* in, ptrdiff_t stride, int n, c
     for (int x = 0; x < n; ++x) Scalar::EmbossSoftPixel(o + x, in + x, stride, light, second + x, first + x);
 }
 void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin, int rowEnd,
-                 const Disc& disc, float amount) {
+                 bool left, bool right, const Disc& disc, float amount) {
     for (int y = rowBegin; y < rowEnd; ++y) {
-        const Scalar::Span span = Scalar::SweepSpanOf(width, x, sourceRow, y, disc);
+        const Scalar::Span span = Scalar::SweepSpanOf(width, x, sourceRow, y, left, right, disc);
         Scalar::SweepSpan(field + ptrdiff_t(y) * stride + span.begin, span.roots, span.end - span.begin, amount);
     }
 }

@@ -44,7 +44,8 @@ using EmbossSoftLightRow = void (*)(const float* o, const float* in, ptrdiff_t s
 
 // One source of the local search, swept over the rows it reaches:
 // for each row y in [rowBegin, rowEnd), a = |y - sourceRow|, the columns
-// x - chords[a] .. x + chords[a] inside [0, width) become
+// x - chords[a] .. x + chords[a] inside [0, width) (only from x on when not
+// `left`, only up to x when not `right`) become
 //     candidate < value ? candidate : value,   candidate = amount + roots[a][dx]
 // with roots[a] pointing at dx = 0 of that row's roots.
 struct Disc {
@@ -52,7 +53,7 @@ struct Disc {
     const float* const* roots;  // roots[a][dx] for |dx| <= chords[a]
 };
 using SweepSource = void (*)(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin,
-                             int rowEnd, const Disc& disc, float amount);
+                             int rowEnd, bool left, bool right, const Disc& disc, float amount);
 
 // A row of the emboss's inward search: for x in [0, n) with cur[x] < 0,
 // out[x] = the largest of cur[x] and every sources[x + dx + a * stride] -
@@ -78,7 +79,7 @@ void EmbossHardLight(const float* f, ptrdiff_t stride, int n, const Light& light
 void EmbossSoftLight(const float* o, const float* in, ptrdiff_t stride, int n, const Light& light,
                      uint8_t* second, uint8_t* first);
 void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin, int rowEnd,
-                 const Disc& disc, float amount);
+                 bool left, bool right, const Disc& disc, float amount);
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n);
 }  // namespace Reference

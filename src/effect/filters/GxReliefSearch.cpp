@@ -23,11 +23,16 @@
 //     at most R(r^2 + 1), which every field the layers build satisfies (their
 //     far value is the radius). Other targets (hand-made fields) take the
 //     literal window scan first.
-//   - Only the outline. A source whose four neighbours are all sources with
-//     an amount no larger (or outside the field) is never the best: for any
-//     pixel, the neighbour on its side is nearer, as near in both
-//     coordinates, so inside the same window, and no dearer. Glyph interiors
-//     sweep nothing; the work is proportional to outline x radius^2 / lanes.
+//   - Only where no neighbour does better. Say a neighbour of a source
+//     serves when it is a source too, with an amount no larger (or lies
+//     outside the field). For a pixel p to the right of the source q, the
+//     right neighbour is nearer to p and no farther in either coordinate (so
+//     inside p's window and disc): if it serves, its candidate is no worse
+//     than q's, and q need not reach p. Likewise left, above and below. So q
+//     sweeps only the columns on the sides whose neighbour does not serve
+//     (and its own), times the rows likewise: nothing inside a glyph, a row
+//     or a half disc along its outline (induction on the distance shows every
+//     pixel still gets its best candidate from some sweep).
 //   - Each swept row is one vector compare-and-select (GxReliefRows).
 //   Beyond kSweepRadius the disc tables grow too large and the older
 //   nearest-first gather serves (a summed-area table skips empty windows,
@@ -323,7 +328,7 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
     }
     delete windowRoots;
 
-    // Every source not dominated by its four neighbours sweeps its disc.
+    // Every source sweeps the part of its disc that no neighbour serves.
     const ReliefRows::SweepSource sweep = ReliefRows::Active().sweepSource;
     for (int j = rowsBegin; j < rowsEnd; ++j) {
         const float* row = field + size_t(j) * stride;
@@ -333,14 +338,20 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
             const float v = row[x];
             if (!(v < 1.0f)) continue;
             const float amount = SourceValue(v, targets);
-            auto covers = [&](const float* line, int at) {
+            auto serves = [&](const float* line, int at) {
                 if (line == nullptr || at < 0 || at >= width) return true;
                 return line[at] < 1.0f && SourceValue(line[at], targets) <= amount;
             };
-            if (covers(row, x - 1) && covers(row, x + 1) && covers(above, x) && covers(below, x)) continue;
-            const int begin = j - r > y0 ? j - r : y0;
-            const int end = int64_t(j) + r + 1 < y1 ? j + r + 1 : y1;
-            if (begin < end) sweep(field, ptrdiff_t(stride), width, x, j, begin, end, disc, amount);
+            const bool left = !serves(row, x - 1);
+            const bool right = !serves(row, x + 1);
+            const bool up = !serves(above, x);
+            const bool down = !serves(below, x);
+            if (!(left || right || up || down)) continue;
+            const int top = up ? j - r : j;
+            const int bottom = down ? int64_t(j) + r + 1 : j + 1;
+            const int begin = top > y0 ? top : y0;
+            const int end = bottom < y1 ? bottom : y1;
+            if (begin < end) sweep(field, ptrdiff_t(stride), width, x, j, begin, end, left, right, disc, amount);
         }
     }
     return 0;
