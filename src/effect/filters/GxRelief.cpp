@@ -7,6 +7,7 @@
 #include "effect/GxBlender.h"
 #include "effect/filters/GxBlurRows.h"
 #include "effect/filters/GxGaussian.h"
+#include "effect/filters/GxReliefRows.h"
 #include "effect/filters/GxSqrt.h"
 
 namespace Glimmer {
@@ -83,6 +84,40 @@ void* GxReliefBuffer::bytes(size_t n) {
 
 // ---- blur
 
+namespace {
+
+// Columns per tile of the blur's zero test.
+constexpr int kBlurTile = 32;
+
+bool AnyNonZero(const unsigned char* p, size_t n) {
+    uint64_t any = 0;
+    size_t i = 0;
+    for (; i + 8 <= n; i += 8) {
+        uint64_t word;
+        std::memcpy(&word, p + i, 8);
+        any |= word;
+    }
+    for (; i < n; ++i) any |= p[i];
+    return any != 0;
+}
+
+// Calls `run(begin, end, active)` for the maximal runs of tiles alike in
+// `active`, as columns clipped to [x0, x1).
+template <typename Run>
+void ForEachRun(const unsigned char* active, int tiles, int x0, int x1, Run run) {
+    int t = x0 / kBlurTile;
+    while (t < tiles && t * kBlurTile < x1) {
+        int u = t + 1;
+        while (u < tiles && u * kBlurTile < x1 && active[u] == active[t]) ++u;
+        const int begin = t * kBlurTile > x0 ? t * kBlurTile : x0;
+        const int end = u * kBlurTile < x1 ? u * kBlurTile : x1;
+        run(begin, end, active[t] != 0);
+        t = u;
+    }
+}
+
+}  // namespace
+
 int ReliefPartialBlur(void* raw) {
     auto* job = static_cast<GxReliefBlurJob*>(raw);
     if (job == nullptr || job->src == nullptr || job->dst == nullptr || job->stride <= 0) return 0;
@@ -98,24 +133,78 @@ int ReliefPartialBlur(void* raw) {
     // column, so the horizontal pass never leaves it; inside the frame those are
     // the zeroed first and last `radius` bytes of a stride-long row. Columns
     // outside [x0, x1) are never written and stay 0.
+    //
+    // Planes are mostly empty around the text. A blur of zeros is zero, so a
+    // tile of columns whose every tap reads 0 gets its zeros without the
+    // kernel: per source row, whether each tile holds anything; down the
+    // columns, how many of the 2R + 1 rows of the window do; along the row,
+    // whether a tile within R columns is non-zero.
+    const int tiles = int((stride + kBlurTile - 1) / kBlurTile);
+    const int firstRow = job->y0 - radius;
+    const size_t rows = size_t(job->y1 - job->y0) + 2 * size_t(radius);
     const size_t paddedBytes = stride + 2 * size_t(radius);
-    unsigned char* padded = nullptr;
-    FreeOnExit freePadded{nullptr};
+    const size_t flagBytes = rows * size_t(tiles);
+    const size_t countBytes = sizeof(int) * size_t(tiles);
+    const size_t bytes = countBytes + paddedBytes + flagBytes + 2 * size_t(tiles);
+    unsigned char* memory = nullptr;
+    FreeOnExit freeMemory{nullptr};
     if (job->scratch != nullptr) {
-        padded = job->scratch->get<unsigned char>(GxScratch::kRows, paddedBytes, true);
+        memory = job->scratch->get<unsigned char>(GxScratch::kRows, bytes, true);
     } else {
-        padded = static_cast<unsigned char*>(std::calloc(paddedBytes, 1));
-        freePadded.pointer = padded;
+        memory = static_cast<unsigned char*>(std::calloc(bytes, 1));
+        freeMemory.pointer = memory;
     }
-    if (padded == nullptr) return -1;
-    unsigned char* row = padded + radius;
-    const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
-    const int n = x1 - x0;
+    if (memory == nullptr) return -1;
+    int* counts = reinterpret_cast<int*>(memory);  // aligned as the block is
+    unsigned char* row = memory + countBytes + radius;
+    unsigned char* flags = memory + countBytes + paddedBytes;
+    unsigned char* columnActive = flags + flagBytes;
+    unsigned char* rowActive = columnActive + tiles;
+    for (size_t j = 0; j < rows; ++j) {
+        const unsigned char* line = job->src + (ptrdiff_t(firstRow) + ptrdiff_t(j)) * ptrdiff_t(stride);
+        for (int t = 0; t < tiles; ++t) {
+            const size_t from = size_t(t) * kBlurTile;
+            const size_t n = stride - from < size_t(kBlurTile) ? stride - from : size_t(kBlurTile);
+            flags[j * tiles + size_t(t)] = AnyNonZero(line + from, n);
+        }
+    }
+    for (int t = 0; t < tiles; ++t) counts[t] = 0;
+    for (size_t j = 0; j + 1 < size_t(2 * radius + 1); ++j)
+        for (int t = 0; t < tiles; ++t) counts[t] += flags[j * tiles + size_t(t)];
 
+    const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
+    const int reach = (radius + kBlurTile - 1) / kBlurTile;
     for (int y = job->y0; y < job->y1; ++y) {
+        // Rows y - R .. y + R are flag rows y - y0 .. y - y0 + 2R.
+        const size_t top = size_t(y - job->y0);
+        const unsigned char* entering = flags + (top + 2 * size_t(radius)) * tiles;
+        for (int t = 0; t < tiles; ++t) {
+            counts[t] += entering[t];
+            columnActive[t] = counts[t] > 0;
+        }
         const unsigned char* centre = job->src + ptrdiff_t(y) * ptrdiff_t(stride);
-        blur(centre + x0, ptrdiff_t(stride), n, gaussian, false, row + x0);
-        blur(row + x0, 1, n, gaussian, false, job->dst + ptrdiff_t(y) * ptrdiff_t(stride) + x0);
+        ForEachRun(columnActive, tiles, x0, x1, [&](int begin, int end, bool active) {
+            if (active) {
+                blur(centre + begin, ptrdiff_t(stride), end - begin, gaussian, false, row + begin);
+            } else {
+                std::memset(row + begin, 0, size_t(end - begin));
+            }
+        });
+        for (int t = 0; t < tiles; ++t) {
+            unsigned char any = 0;
+            for (int u = t - reach > 0 ? t - reach : 0; u <= t + reach && u < tiles; ++u) any |= columnActive[u];
+            rowActive[t] = any;
+        }
+        unsigned char* out = job->dst + ptrdiff_t(y) * ptrdiff_t(stride);
+        ForEachRun(rowActive, tiles, x0, x1, [&](int begin, int end, bool active) {
+            if (active) {
+                blur(row + begin, 1, end - begin, gaussian, false, out + begin);
+            } else {
+                std::memset(out + begin, 0, size_t(end - begin));
+            }
+        });
+        const unsigned char* leaving = flags + top * tiles;
+        for (int t = 0; t < tiles; ++t) counts[t] -= leaving[t];
     }
     return 0;
 }
@@ -274,10 +363,11 @@ GxReliefPalette::GxReliefPalette(float gain, uint32_t firstColour, uint32_t seco
 
 void ReliefColourise(const unsigned char* first, const unsigned char* second, size_t count,
                      float gain, uint32_t firstColour, uint32_t secondColour, uint32_t* out) {
-    const GxReliefPalette palette(gain, firstColour, secondColour);
-    for (size_t i = 0; i < count; ++i) {
-        const int d = palette.tone[first[i]] - palette.tone[second[i]];
-        out[i] = d > 0 ? palette.firstTint[d > 255 ? 255 : d] : palette.secondTint[-d > 255 ? 255 : -d];
+    const ReliefRows::ColouriseRow colourise = ReliefRows::Active().colourise;
+    constexpr size_t kChunk = size_t(1) << 24;
+    for (size_t i = 0; i < count; i += kChunk) {
+        const size_t n = count - i < kChunk ? count - i : kChunk;
+        colourise(first + i, second + i, int(n), gain, firstColour, secondColour, out + i);
     }
 }
 

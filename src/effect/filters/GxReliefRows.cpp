@@ -9,6 +9,9 @@
 // 0..256, the plane bytes in 32-bit lanes. A pixel the scalar loop skips
 // keeps its byte: it is loaded and selected back.
 //
+// Colouring: the tones as float products truncated to ints, the tint's three
+// channels in 32-bit lanes, the winner's colour chosen by mask.
+//
 // The searches: the sweep is one compare-and-select per column of the
 // source's disc (a span shorter than a vector takes a narrower one, and the
 // last vector may overlap the one before it: taking a minimum twice changes
@@ -94,6 +97,13 @@ inline float InwardPixel(const float* sources, ptrdiff_t stride, int above, int 
         }
     }
     return cur;
+}
+
+inline uint32_t ColourPixel(uint8_t first, uint8_t second, float gain, uint32_t firstColour,
+                            uint32_t secondColour) {
+    const GxReliefTone tone = ReliefTone(first, second, gain);
+    const int alpha = tone.difference > 255 ? 255 : tone.difference;
+    return ReliefTint(tone.first ? firstColour : secondColour, alpha);
 }
 
 // The span of row y that the disc of a source at (x, sourceRow) covers, and
@@ -351,8 +361,39 @@ void InwardRow(const float* HWY_RESTRICT sources, ptrdiff_t stride, int above, i
     for (; x < n; ++x) out[x] = Scalar::InwardPixel(sources + x, stride, above, below, radius, roots, cur[x]);
 }
 
+void Colourise(const uint8_t* HWY_RESTRICT first, const uint8_t* HWY_RESTRICT second, int n, float gain,
+               uint32_t firstColour, uint32_t secondColour, uint32_t* HWY_RESTRICT out) {
+    int x = 0;
+#if HWY_TARGET != HWY_SCALAR
+    const DF df;
+    const DI di;
+    const D8 d8;
+    const hn::RebindToUnsigned<DI> du;
+    const int N = int(hn::Lanes(df));
+    const VF g = hn::Set(df, gain);
+    const VI zero = hn::Zero(di);
+    const VI most = hn::Set(di, 255);
+    for (; x + N <= n; x += N) {
+        const VI s = hn::ConvertTo(di, hn::Mul(g, hn::ConvertTo(df, hn::PromoteTo(di, hn::LoadU(d8, first + x)))));
+        const VI l = hn::ConvertTo(di, hn::Mul(g, hn::ConvertTo(df, hn::PromoteTo(di, hn::LoadU(d8, second + x)))));
+        const VI d = hn::Sub(s, l);
+        const auto firstWins = hn::Gt(d, zero);
+        const VI alpha = hn::Min(hn::Abs(d), most);
+        VI word = hn::ShiftLeft<24>(alpha);
+        for (int shift = 16; shift >= 0; shift -= 8) {
+            const VI channel = hn::IfThenElse(firstWins, hn::Set(di, int((firstColour >> shift) & 0xFF)),
+                                              hn::Set(di, int((secondColour >> shift) & 0xFF)));
+            const VI v = hn::Min(hn::ShiftRight<8>(hn::Mul(hn::Add(channel, hn::Set(di, 1)), alpha)), most);
+            word = hn::Or(word, hn::ShiftLeftSame(v, shift));
+        }
+        hn::StoreU(hn::BitCast(du, word), du, out + x);
+    }
+#endif
+    for (; x < n; ++x) out[x] = Scalar::ColourPixel(first[x], second[x], gain, firstColour, secondColour);
+}
+
 const Table* GetTable() {
-    static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, InwardRow};
+    static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, InwardRow, Colourise};
     return &table;
 }
 
@@ -387,11 +428,15 @@ void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int
                const float* cur, float* out, int n) {
     for (int x = 0; x < n; ++x) out[x] = Scalar::InwardPixel(sources + x, stride, above, below, radius, roots, cur[x]);
 }
+void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, uint32_t firstColour,
+               uint32_t secondColour, uint32_t* out) {
+    for (int x = 0; x < n; ++x) out[x] = Scalar::ColourPixel(first[x], second[x], gain, firstColour, secondColour);
+}
 }  // namespace Reference
 
 const Table& ReferenceTable() {
     static const Table table = {Reference::BevelLight, Reference::EmbossHardLight, Reference::EmbossSoftLight,
-                                Reference::SweepSource, Reference::InwardRow};
+                                Reference::SweepSource, Reference::InwardRow, Reference::Colourise};
     return table;
 }
 

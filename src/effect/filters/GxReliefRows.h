@@ -1,7 +1,8 @@
 #pragma once
 // The row kernels of the relief layers (bevel, emboss): the lighting of a row
 // of the height field into the two wash planes, one source's sweep of the
-// local distance search, and a row of the emboss's inward search.
+// local distance search, a row of the emboss's inward search, and the
+// colouring of the two washes.
 //
 // Each is written once as the literal scalar loop (Reference) and once with
 // Highway, compiled for SSE4, AVX2 and AVX-512 on x86-64 and NEON on 64-bit
@@ -64,12 +65,19 @@ using SweepSource = void (*)(float* field, ptrdiff_t stride, int width, int x, i
 using InwardRow = void (*)(const float* sources, ptrdiff_t stride, int above, int below, int radius,
                            const float* roots, const float* cur, float* out, int n);
 
+// The colouring of n pixels (ReliefColourise): s = int(gain * first),
+// l = int(gain * second); the winner's colour (the first when s > l)
+// premultiplied by min(|s - l|, 255), as 0xAARRGGBB.
+using ColouriseRow = void (*)(const uint8_t* first, const uint8_t* second, int n, float gain,
+                              uint32_t firstColour, uint32_t secondColour, uint32_t* out);
+
 struct Table {
     BevelLightRow bevelLight;
     EmbossHardLightRow embossHardLight;
     EmbossSoftLightRow embossSoftLight;
     SweepSource sweepSource;
     InwardRow inwardRow;
+    ColouriseRow colourise;
 };
 
 namespace Reference {
@@ -82,6 +90,8 @@ void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow
                  bool left, bool right, const Disc& disc, float amount);
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n);
+void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, uint32_t firstColour,
+               uint32_t secondColour, uint32_t* out);
 }  // namespace Reference
 
 const Table& ReferenceTable();

@@ -55,6 +55,7 @@
 
 #include "effect/filters/GxRelief.h"
 #include "effect/filters/GxReliefRows.h"
+#include "effect/filters/GxSqrt.h"
 
 namespace Glimmer {
 namespace {
@@ -78,6 +79,18 @@ inline bool IsTarget(float v, GxReliefTargets targets) {
 // The amount a source contributes before its root is added.
 inline float SourceValue(float v, GxReliefTargets targets) {
     return targets == GxReliefTargets::kPositive && !(v > 0.0f) ? 0.0f : v;
+}
+
+// sqrt(i) as the rounded table holds it (IntSqrt: the largest k with
+// (2k - 1)^2 <= 4e6 i, over 1000), found from the double root and checked
+// in integers instead of by a binary search.
+float TableRoot(int64_t i) {
+    if (i < kIntSqrtTableSize) return GX_INT_SQRT_TABLE[size_t(i)];
+    const uint64_t target = uint64_t(4000000) * uint64_t(i);
+    uint64_t k = uint64_t(std::llround(std::sqrt(double(i)) * 1000.0));
+    while (k > 0 && (2 * k - 1) * (2 * k - 1) > target) --k;
+    while ((2 * k + 1) * (2 * k + 1) <= target) ++k;
+    return float(double(k) / 1000.0);
 }
 
 inline int ClampRadius(int radius, int width, int height) {
@@ -271,17 +284,34 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
     const int rowsBegin = y0 - r > 0 ? y0 - r : 0;
     const int rowsEnd = int64_t(y1) + r < height ? y1 + r : height;
     const size_t stride = size_t(width);
-    if (targets == GxReliefTargets::kNonZero) {
-        for (size_t i = size_t(rowsBegin) * stride; i < size_t(rowsEnd) * stride; ++i) {
-            if (field[i] < 0.0f) {
-                ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
-                return 0;
-            }
-        }
+    // A negative source (kNonZero) and targets above R(r^2 + 1): see the top.
+    const float bound = TableRoot(int64_t(r) * r + 1);
+    bool negative = false;
+    bool wide = false;
+    for (int j = rowsBegin; j < rowsEnd; ++j) {
+        const float* row = field + size_t(j) * stride;
+        int below = 0;
+        int above = 0;
+        for (int x = 0; x < width; ++x) below |= row[x] < 0.0f;
+        if (j >= y0 && j < y1)
+            for (int x = 0; x < width; ++x) above |= row[x] > bound;  // targets all, as bound > 0
+        negative |= below != 0 && targets == GxReliefTargets::kNonZero;
+        wide |= above != 0;
+    }
+    if (negative) {
+        ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+        return 0;
     }
     if (r > kSweepRadius) {
         NearestFirst(field, width, height, r, y0, y1, targets);
         return 0;
+    }
+    if (wide) {
+        GxReliefRoots windowRoots(ReliefLargestRootIndex(width, height, r));
+        for (int y = y0; y < y1; ++y)
+            for (int x = 0; x < width; ++x)
+                if (field[size_t(y) * stride + size_t(x)] > bound)
+                    OutwardPixel(field, width, height, r, x, y, targets, windowRoots);
     }
 
     // The disc: chords[a] = the largest c with a^2 + c^2 <= r^2, and the roots
@@ -297,7 +327,6 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
     auto** rootRows = reinterpret_cast<const float**>(memory);
     auto* chords = reinterpret_cast<int*>(memory + rows * sizeof(const float*));
     auto* rootValues = reinterpret_cast<float*>(memory + rows * (sizeof(const float*) + sizeof(int)));
-    GxReliefRoots roots(int64_t(r) * r + 1);
     float* next = rootValues;
     int chord = r;
     for (int a = 0; a <= r; ++a) {
@@ -305,28 +334,9 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
         while (a2 + int64_t(chord) * chord > int64_t(r) * r) --chord;
         chords[a] = chord;
         rootRows[a] = next + chord;
-        for (int dx = -chord; dx <= chord; ++dx) *next++ = roots[a2 + int64_t(dx) * dx];
+        for (int dx = -chord; dx <= chord; ++dx) *next++ = TableRoot(a2 + int64_t(dx) * dx);
     }
     const ReliefRows::Disc disc{chords, rootRows};
-
-    // Targets above R(r^2 + 1): the literal window first (see the top).
-    const float bound = roots[int64_t(r) * r + 1];
-    GxReliefRoots* windowRoots = nullptr;
-    for (int y = y0; y < y1; ++y) {
-        const float* row = field + size_t(y) * stride;
-        for (int x = 0; x < width; ++x) {
-            if (!(IsTarget(row[x], targets) && row[x] > bound)) continue;
-            if (windowRoots == nullptr) {
-                windowRoots = new (std::nothrow) GxReliefRoots(ReliefLargestRootIndex(width, height, r));
-                if (windowRoots == nullptr) {
-                    ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
-                    return 0;
-                }
-            }
-            OutwardPixel(field, width, height, r, x, y, targets, *windowRoots);
-        }
-    }
-    delete windowRoots;
 
     // Every source sweeps the part of its disc that no neighbour serves.
     const ReliefRows::SweepSource sweep = ReliefRows::Active().sweepSource;
@@ -406,10 +416,9 @@ void ReliefInwardDistance(float* field, int width, int height, int radius, int y
         for (size_t x = 0; x < stride; ++x) p[r + x] = row[x] > 1.0f ? row[x] : none;
         for (size_t i = size_t(r) + stride; i < planeStride; ++i) p[i] = none;
     }
-    GxReliefRoots roots(2 * int64_t(r) * r);
     for (int a = -r; a <= r; ++a)
         for (int dx = -r; dx <= r; ++dx)
-            windowRoots[size_t(a + r) * side + size_t(dx + r)] = roots[int64_t(a) * a + int64_t(dx) * dx];
+            windowRoots[size_t(a + r) * side + size_t(dx + r)] = TableRoot(int64_t(a) * a + int64_t(dx) * dx);
 
     const ReliefRows::InwardRow inwardRow = ReliefRows::Active().inwardRow;
     for (int y = y0; y < y1; ++y) {
