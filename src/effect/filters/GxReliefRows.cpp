@@ -99,6 +99,15 @@ inline float InwardPixel(const float* sources, ptrdiff_t stride, int above, int 
     return cur;
 }
 
+inline float SourceAmount(float v, bool positive) { return positive && !(v > 0.0f) ? 0.0f : v; }
+
+inline uint8_t SidesOf(float above, float left, float v, float right, float below, bool positive) {
+    if (!(v < 1.0f)) return 0;
+    const float amount = SourceAmount(v, positive);
+    auto fails = [&](float n) { return n < 1.0f && SourceAmount(n, positive) <= amount ? 0 : 1; };
+    return uint8_t(fails(left) | fails(right) << 1 | fails(above) << 2 | fails(below) << 3);
+}
+
 inline uint32_t ColourPixel(uint8_t first, uint8_t second, float gain, uint32_t firstColour,
                             uint32_t secondColour) {
     const GxReliefTone tone = ReliefTone(first, second, gain);
@@ -332,6 +341,34 @@ void SweepSource(float* HWY_RESTRICT field, ptrdiff_t stride, int width, int x, 
     }
 }
 
+void SweepSides(const float* HWY_RESTRICT above, const float* HWY_RESTRICT row, const float* HWY_RESTRICT below,
+                int n, bool positive, uint8_t* HWY_RESTRICT sides) {
+    int x = 1;
+#if HWY_TARGET != HWY_SCALAR
+    const DF df;
+    const DI di;
+    const D8 d8;
+    const int N = int(hn::Lanes(df));
+    const VF one = hn::Set(df, 1.0f);
+    const VF zero = hn::Zero(df);
+    auto amountOf = [&](VF v) { return positive ? hn::IfThenElse(hn::Gt(v, zero), v, zero) : v; };
+    for (; x + N + 1 <= n; x += N) {
+        const VF v = hn::LoadU(df, row + x);
+        const VF amount = amountOf(v);
+        // A side's bit where the neighbour does not serve.
+        auto bit = [&](VF neighbour, int value) {
+            const auto serves = hn::And(hn::Lt(neighbour, one), hn::Le(amountOf(neighbour), amount));
+            return hn::IfThenZeroElse(hn::RebindMask(di, serves), hn::Set(di, value));
+        };
+        VI bits = hn::Or(hn::Or(bit(hn::LoadU(df, row + x - 1), 1), bit(hn::LoadU(df, row + x + 1), 2)),
+                         hn::Or(bit(hn::LoadU(df, above + x), 4), bit(hn::LoadU(df, below + x), 8)));
+        bits = hn::IfThenElseZero(hn::RebindMask(di, hn::Lt(v, one)), bits);
+        hn::StoreU(hn::DemoteTo(d8, bits), d8, sides + x);
+    }
+#endif
+    for (; x + 1 < n; ++x) sides[x] = Scalar::SidesOf(above[x], row[x - 1], row[x], row[x + 1], below[x], positive);
+}
+
 void InwardRow(const float* HWY_RESTRICT sources, ptrdiff_t stride, int above, int below, int radius,
                const float* HWY_RESTRICT roots, const float* HWY_RESTRICT cur, float* HWY_RESTRICT out, int n) {
     int x = 0;
@@ -393,7 +430,8 @@ void Colourise(const uint8_t* HWY_RESTRICT first, const uint8_t* HWY_RESTRICT se
 }
 
 const Table* GetTable() {
-    static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, InwardRow, Colourise};
+    static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, SweepSides, InwardRow,
+                                Colourise};
     return &table;
 }
 
@@ -424,6 +462,10 @@ void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow
         Scalar::SweepSpan(field + ptrdiff_t(y) * stride + span.begin, span.roots, span.end - span.begin, amount);
     }
 }
+void SweepSides(const float* above, const float* row, const float* below, int n, bool positive, uint8_t* sides) {
+    for (int x = 1; x + 1 < n; ++x)
+        sides[x] = Scalar::SidesOf(above[x], row[x - 1], row[x], row[x + 1], below[x], positive);
+}
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n) {
     for (int x = 0; x < n; ++x) out[x] = Scalar::InwardPixel(sources + x, stride, above, below, radius, roots, cur[x]);
@@ -436,7 +478,8 @@ void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, u
 
 const Table& ReferenceTable() {
     static const Table table = {Reference::BevelLight, Reference::EmbossHardLight, Reference::EmbossSoftLight,
-                                Reference::SweepSource, Reference::InwardRow, Reference::Colourise};
+                                Reference::SweepSource, Reference::SweepSides, Reference::InwardRow,
+                                Reference::Colourise};
     return table;
 }
 

@@ -56,6 +56,15 @@ struct Disc {
 using SweepSource = void (*)(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin,
                              int rowEnd, bool left, bool right, const Disc& disc, float amount);
 
+// Which sides of its disc each pixel of a row sweeps in the outward search,
+// for x in [1, n - 1): 0 unless row[x] < 1.0 (a source), else bit 0 when the
+// pixel to the left does not serve, bit 1 the one to the right, bit 2 above,
+// bit 3 below. A neighbour serves when it is a source whose amount is no
+// larger; the amount of v is v, or (`positive`) 0 when v is not above 0.
+// sides[0] and sides[n - 1] are not written.
+using SweepSides = void (*)(const float* above, const float* row, const float* below, int n, bool positive,
+                            uint8_t* sides);
+
 // A row of the emboss's inward search: for x in [0, n) with cur[x] < 0,
 // out[x] = the largest of cur[x] and every sources[x + dx + a * stride] -
 // roots[(a + radius) * (2 * radius + 1) + dx + radius] (kept only when
@@ -76,6 +85,7 @@ struct Table {
     EmbossHardLightRow embossHardLight;
     EmbossSoftLightRow embossSoftLight;
     SweepSource sweepSource;
+    SweepSides sweepSides;
     InwardRow inwardRow;
     ColouriseRow colourise;
 };
@@ -88,6 +98,7 @@ void EmbossSoftLight(const float* o, const float* in, ptrdiff_t stride, int n, c
                      uint8_t* second, uint8_t* first);
 void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin, int rowEnd,
                  bool left, bool right, const Disc& disc, float amount);
+void SweepSides(const float* above, const float* row, const float* below, int n, bool positive, uint8_t* sides);
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n);
 void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, uint32_t firstColour,

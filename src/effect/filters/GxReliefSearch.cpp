@@ -338,30 +338,48 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
     }
     const ReliefRows::Disc disc{chords, rootRows};
 
-    // Every source sweeps the part of its disc that no neighbour serves.
+    // Every source sweeps the part of its disc that no neighbour serves. Per
+    // row, branch-free (it vectorises): which sides each pixel sweeps, as bits
+    // (0: not a source, or served on every side). Outside the field a row of
+    // -infinity stands in: a source with an amount below any.
     const ReliefRows::SweepSource sweep = ReliefRows::Active().sweepSource;
+    GxReliefBuffer rowMemory(scratch, GxScratch::kPlaneC);
+    auto* rowBytes = rowMemory.get<unsigned char>((stride + 2) * (sizeof(float) + 1));
+    if (rowBytes == nullptr) {
+        ReliefLocalDistanceReference(field, width, height, r, y0, y1, targets);
+        return 0;
+    }
+    auto* outside = reinterpret_cast<float*>(rowBytes);
+    unsigned char* sides = rowBytes + (stride + 2) * sizeof(float);
+    for (size_t i = 0; i < stride + 2; ++i) outside[i] = -std::numeric_limits<float>::infinity();
+    const bool positive = targets == GxReliefTargets::kPositive;
+    const ReliefRows::SweepSides sidesOf = ReliefRows::Active().sweepSides;
     for (int j = rowsBegin; j < rowsEnd; ++j) {
         const float* row = field + size_t(j) * stride;
-        const float* above = j > 0 ? row - stride : nullptr;
-        const float* below = j + 1 < height ? row + stride : nullptr;
+        const float* above = j > 0 ? row - stride : outside + 1;
+        const float* below = j + 1 < height ? row + stride : outside + 1;
+        // The two end columns through a padded copy of their neighbourhood.
+        for (int x : {0, width - 1}) {
+            const float left = x > 0 ? row[x - 1] : outside[0];
+            const float right = x + 1 < width ? row[x + 1] : outside[0];
+            const float line[3] = {left, row[x], right};
+            const float up[3] = {0.0f, above[x], 0.0f};
+            const float down[3] = {0.0f, below[x], 0.0f};
+            unsigned char bits[3];
+            ReliefRows::Reference::SweepSides(up, line, down, 3, positive, bits);
+            sides[x] = bits[1];
+        }
+        sidesOf(above, row, below, width, positive, sides);
+        auto amountOf = [positive](float v) { return positive && !(v > 0.0f) ? 0.0f : v; };
         for (int x = 0; x < width; ++x) {
-            const float v = row[x];
-            if (!(v < 1.0f)) continue;
-            const float amount = SourceValue(v, targets);
-            auto serves = [&](const float* line, int at) {
-                if (line == nullptr || at < 0 || at >= width) return true;
-                return line[at] < 1.0f && SourceValue(line[at], targets) <= amount;
-            };
-            const bool left = !serves(row, x - 1);
-            const bool right = !serves(row, x + 1);
-            const bool up = !serves(above, x);
-            const bool down = !serves(below, x);
-            if (!(left || right || up || down)) continue;
-            const int top = up ? j - r : j;
-            const int bottom = down ? int64_t(j) + r + 1 : j + 1;
+            const int bits = sides[x];
+            if (bits == 0) continue;
+            const int top = bits & 4 ? j - r : j;
+            const int bottom = bits & 8 ? int(int64_t(j) + r + 1) : j + 1;
             const int begin = top > y0 ? top : y0;
             const int end = bottom < y1 ? bottom : y1;
-            if (begin < end) sweep(field, ptrdiff_t(stride), width, x, j, begin, end, left, right, disc, amount);
+            if (begin < end)
+                sweep(field, ptrdiff_t(stride), width, x, j, begin, end, bits & 1, bits & 2, disc, amountOf(row[x]));
         }
     }
     return 0;
