@@ -167,7 +167,7 @@ void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
             for (int x = M; x <= last; ++x)
                 if (bytes[x - M] != 0) row[x] = glyphValue;
         }
-        if (!ReliefExactTransform(field, W, H)) return;
+        if (!ReliefExactTransform(field, W, H, scratch)) return;
         const float rangeSquared = float(int64_t(g.range) * g.range);
         for (size_t i = 0; i < N; ++i) {
             const float v = field[i];

@@ -261,7 +261,7 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
                 in[x] = kFar;
             }
         }
-        if (!ReliefExactTransform(outer, W, H) || !ReliefExactTransform(inner, W, H)) return;
+        if (!ReliefExactTransform(outer, W, H, scratch) || !ReliefExactTransform(inner, W, H, scratch)) return;
         for (size_t i = 0; i < N; ++i) {
             outer[i] = outer[i] >= 0.0f ? fsqrt(outer[i]) : 0.0f;
             inner[i] = inner[i] >= 0.0f ? fsqrt(inner[i]) : 0.0f;

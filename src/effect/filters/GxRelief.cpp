@@ -265,10 +265,10 @@ void ReliefDT1D(const float* f, float* d, int n) {
     ReliefDT1D(f, d, n, v, z);
 }
 
-bool ReliefExactTransform(float* field, int width, int height) {
+bool ReliefExactTransformReference(float* field, int width, int height) {
     if (field == nullptr || width <= 0 || height <= 0) return true;
     const size_t n = size_t(width > height ? width : height);
-    float* line = static_cast<float*>(std::malloc(sizeof(float) * n));
+    float* line = static_cast<float*>(std::calloc(n, sizeof(float)));  // calloc: GCC 12 warns otherwise
     FreeOnExit freeLine{line};
     float* out = static_cast<float*>(std::malloc(sizeof(float) * n));
     FreeOnExit freeOut{out};
@@ -288,6 +288,145 @@ bool ReliefExactTransform(float* field, int width, int height) {
         float* row = field + size_t(y) * stride;
         std::memcpy(line, row, sizeof(float) * stride);
         ReliefDT1D(line, row, width, v, z);
+    }
+    return true;
+}
+
+namespace {
+
+// Longest side of a field the fast transform takes (see below).
+constexpr int kFastTransformSide = 4096;
+
+// ReliefDT1D over the entries other than kFar, their positions kept; a line
+// of kFar alone gives kFar throughout.
+void EnvelopeOfNear(const float* f, float* d, int n, int* v, float* z) {
+    int k = -1;
+    for (int q = 0; q < n; ++q) {
+        if (f[q] == kFar) continue;
+        const float fq = f[q] + float(int64_t(q) * q);
+        if (k < 0) {
+            k = 0;
+            v[0] = q;
+            z[0] = -kFar;
+            z[1] = kFar;
+            continue;
+        }
+        float s;
+        for (;;) {
+            const int vk = v[k];
+            s = (fq - (f[vk] + float(int64_t(vk) * vk))) / float(2 * int64_t(q) - 2 * int64_t(vk));
+            if (k > 0 && s <= z[k]) {
+                --k;
+                continue;
+            }
+            break;
+        }
+        ++k;
+        v[k] = q;
+        z[k] = s;
+        z[k + 1] = kFar;
+    }
+    if (k < 0) {
+        for (int p = 0; p < n; ++p) d[p] = kFar;
+        return;
+    }
+    k = 0;
+    for (int p = 0; p < n; ++p) {
+        while (z[k + 1] < float(p)) ++k;
+        const int64_t dp = int64_t(p) - v[k];
+        d[p] = f[v[k]] + float(dp * dp);
+    }
+}
+
+// A line of 0 and kFar only: the square of the distance to the nearest 0, or
+// kFar when there is none.
+void NearestZero(float* line, int n) {
+    constexpr int kNone = 1 << 30;
+    int last = -kNone;
+    for (int p = 0; p < n; ++p) {
+        if (line[p] == 0.0f) last = p;
+        line[p] = float(p - last < kNone ? p - last : kNone);  // exact: below 2^24 or kNone
+    }
+    int next = kNone + n;
+    for (int p = n - 1; p >= 0; --p) {
+        if (line[p] == 0.0f) next = p;
+        const int64_t up = int64_t(line[p]);
+        const int64_t down = int64_t(next) - p;
+        const int64_t nearest = up < down ? up : down;
+        line[p] = nearest < n ? float(nearest * nearest) : kFar;
+    }
+}
+
+}  // namespace
+
+// The transform of the fields the layers build (every value 0 or kFar, sides
+// up to 4096), with the literal's float arithmetic left out where it cannot
+// change a bit:
+//   - kFar entries never take part. Entering the envelope after a nearer
+//     parabola a, kFar at q meets it at (1e20 - F_a) / 2(q - a), above every
+//     position; the next nearer parabola meets kFar at a hugely negative point
+//     and pops it (two kFar entries meet at 0 and the later pops the earlier),
+//     leaving the walk where it stood without it; a kFar first entry is never
+//     popped but loses every position to the first nearer one. So the outputs
+//     are those of the envelope over the other entries (same operations),
+//     and kFar + dp^2 is kFar for every dp below 2^21.
+//   - A line of 0 and kFar: the parabolas q^2 (exact below 2^24) meet at
+//     (q + q') / 2, exactly, never pop one another, and each position takes
+//     its nearest zero (a tie, at a half-way point, takes either: same value).
+//     So the output is the squared distance to the nearest zero, which two
+//     sweeps give. Every column of the first pass is such a line, as is every
+//     row of the second that holds only 0 and kFar.
+// Other rows take the envelope without their kFar entries.
+bool ReliefExactTransform(float* field, int width, int height, GxScratch* scratch) {
+    if (field == nullptr || width <= 0 || height <= 0) return true;
+    const size_t stride = size_t(width);
+    const size_t pixels = stride * size_t(height);
+    bool binary = width <= kFastTransformSide && height <= kFastTransformSide;
+    for (size_t i = 0; binary && i < pixels; ++i) binary = field[i] == 0.0f || field[i] == kFar;
+    if (!binary) return ReliefExactTransformReference(field, width, height);
+
+    GxReliefBuffer memory(scratch, GxScratch::kRows);
+    auto* words = memory.get<int32_t>(3 * stride + 1);
+    if (words == nullptr) return false;
+    auto* last = words;           // per column: the row of the last 0 above
+    int* v = words + stride;      // the envelope of a row
+    auto* z = reinterpret_cast<float*>(words + 2 * stride);
+    static_assert(sizeof(float) == sizeof(int32_t));
+
+    // Columns: the distance to the last 0 above, then, from below, the nearest.
+    constexpr int kNone = 1 << 30;
+    for (size_t x = 0; x < stride; ++x) last[x] = -kNone;
+    for (int y = 0; y < height; ++y) {
+        float* row = field + size_t(y) * stride;
+        for (size_t x = 0; x < stride; ++x) {
+            if (row[x] == 0.0f) last[x] = y;
+            const int up = y - last[x];
+            row[x] = float(up < kNone ? up : kNone);
+        }
+    }
+    for (size_t x = 0; x < stride; ++x) last[x] = kNone + height;  // now: the next 0 below
+    for (int y = height - 1; y >= 0; --y) {
+        float* row = field + size_t(y) * stride;
+        for (size_t x = 0; x < stride; ++x) {
+            if (row[x] == 0.0f) last[x] = y;
+            const int64_t up = int64_t(row[x]);
+            const int64_t down = int64_t(last[x]) - y;
+            const int64_t nearest = up < down ? up : down;
+            row[x] = nearest < height ? float(nearest * nearest) : kFar;
+        }
+    }
+    // Rows.
+    auto* line = reinterpret_cast<float*>(last);  // the columns are done with it
+    for (int y = 0; y < height; ++y) {
+        float* row = field + size_t(y) * stride;
+        bool zeroOrFar = true;
+        for (size_t x = 0; x < stride; ++x) zeroOrFar &= row[x] == 0.0f || row[x] == kFar;
+        if (zeroOrFar) {
+            NearestZero(row, width);
+        } else {
+            std::memcpy(line, row, sizeof(float) * stride);
+            EnvelopeOfNear(line, row, width, v, z);
+        }
     }
     return true;
 }

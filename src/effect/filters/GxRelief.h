@@ -164,8 +164,11 @@ void ReliefDT1D(const float* f, float* d, int n);
 // The same with caller scratch: v holds n ints, z n + 1 floats.
 void ReliefDT1D(const float* f, float* d, int n, int* v, float* z);
 // The transform down every column, then along every row, in place. false
-// (field untouched or half done) when scratch could not be had.
-bool ReliefExactTransform(float* field, int width, int height);
+// (field untouched or half done) when scratch could not be had. With
+// `scratch` its buffers come from the kRows slot.
+bool ReliefExactTransform(float* field, int width, int height, GxScratch* scratch = nullptr);
+// The same, line by line through ReliefDT1D: what the above must give.
+bool ReliefExactTransformReference(float* field, int width, int height);
 
 // What counts as a pixel to improve in the local search.
 enum class GxReliefTargets {

@@ -88,6 +88,23 @@ TEST(ReliefKernels, DistanceTransformsAgainstBruteForce) {
             }
         }
     }
+    // The fast transform beside the literal one on fields of 0 and kFar as the
+    // layers build them: sparse seeds, glyph-like blocks, empty and full lines.
+    for (int trial = 0; trial < 24; ++trial) {
+        const int w = 1 + int(rng() % 70), h = 1 + int(rng() % 50);
+        const unsigned density = 1 + rng() % 6;
+        std::vector<float> fast(size_t(w) * h);
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x) {
+                bool zero = trial % 3 == 0 ? rng() % (3 * density) == 0 : ((x / 7 + y / 5) % density == 0);
+                if (trial % 4 == 1 && (x % 11 == 3 || y % 9 == 2)) zero = trial % 8 == 1;  // whole lines alike
+                fast[size_t(y) * w + x] = (zero != (trial % 2 == 0)) ? 0.0f : kFar;
+            }
+        std::vector<float> slow = fast;
+        ASSERT_TRUE(ReliefExactTransform(fast.data(), w, h));
+        ASSERT_TRUE(ReliefExactTransformReference(slow.data(), w, h));
+        ASSERT_EQ(std::memcmp(fast.data(), slow.data(), fast.size() * sizeof(float)), 0) << w << "x" << h;
+    }
     const int w = 17, h = 11;
     std::vector<float> field(w * h);
     for (float& v : field) v = rng() % 9 == 0 ? 0.0f : kFar;
