@@ -57,33 +57,6 @@ constexpr float kFar = 1e20f;
 constexpr int kExactFromSize = 26;
 constexpr int kTwoSidedStyle = 3;
 
-// ((difference + 1) * weight) >> 8, 255 when the product reaches 65536.
-inline int WeightedAlpha(int difference, int weight) {
-    const int product = (difference + 1) * weight;
-    return product >= 65536 ? 255 : product >> 8;
-}
-
-inline int Channel(uint32_t argb, int shift) { return int((argb >> shift) & 0xFF); }
-
-// The two-sided pixel: the normal relief (weight m) over the mirrored one.
-// `normal` and `mirrored` are the signed tone differences s - l.
-uint32_t TwoSidedPixel(const GxReliefPalette& palette, int normal, int mirrored, int m) {
-    const int alpha1 = WeightedAlpha(normal < 0 ? -normal : normal, m);
-    const int alpha2 = WeightedAlpha(mirrored < 0 ? -mirrored : mirrored, 255 - m);
-    const uint32_t c1 = normal > 0 ? palette.firstTint[alpha1] : palette.secondTint[alpha1];
-    const uint32_t c2 = mirrored > 0 ? palette.firstTint[alpha2] : palette.secondTint[alpha2];
-    if (alpha1 == 0) return c2;
-    if (alpha1 == 255) return c1;
-    const int k = 255 - alpha1;
-    int alpha = alpha1 + ((k * (alpha2 + 1)) >> 8);
-    uint32_t out = uint32_t(alpha > 255 ? 255 : alpha) << 24;
-    for (int shift = 16; shift >= 0; shift -= 8) {
-        const int v = Channel(c1, shift) + ((k * (Channel(c2, shift) + 1)) >> 8);
-        out |= uint32_t(v > 255 ? 255 : v) << shift;
-    }
-    return out;
-}
-
 }  // namespace
 
 GxEmboss::GxEmboss() { style = GxECore::kEmboss; }
@@ -308,22 +281,19 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
         ReliefColourise(normal.first, normal.second, N, g.gain, ReliefFirstColour(prop), ReliefSecondColour(prop),
                         argb);
     } else {
-        const GxReliefPalette palette(g.gain, ReliefFirstColour(prop), ReliefSecondColour(prop));
         // The coverage weighs the normal relief strictly inside the text
         // rectangle's first row and column: columns M + 1 .. W - M - 1.
+        unsigned char* coverage = rowMemory.get<unsigned char>(stride);
+        if (coverage == nullptr) return;
         const int width = W - 2 * M - 1;
-        unsigned char* bytes = rowMemory.get<unsigned char>(size_t(width > 0 ? width : 1));
-        if (bytes == nullptr) return;
+        const ReliefRows::TwoSidedRow twoSidedRow = ReliefRows::Active().twoSided;
         for (int y = 0; y < H; ++y) {
-            const bool rowInside = y > M && y < H - M && width > 0;
-            if (rowInside) ReliefMaskRow(mask, int64_t(frame.x0) + M + 1, int64_t(frame.y0) + y, width, bytes);
-            const size_t at = size_t(y) * stride;
-            for (int x = 0; x < W; ++x) {
-                const size_t i = at + size_t(x);
-                const int m = rowInside && x > M && x < W - M ? int(bytes[x - M - 1]) : 0;
-                argb[i] = TwoSidedPixel(palette, palette.tone[normal.first[i]] - palette.tone[normal.second[i]],
-                                        palette.tone[mirrored.first[i]] - palette.tone[mirrored.second[i]], m);
-            }
+            std::memset(coverage, 0, stride);
+            if (y > M && y < H - M && width > 0)
+                ReliefMaskRow(mask, int64_t(frame.x0) + M + 1, int64_t(frame.y0) + y, width, coverage + M + 1);
+            const size_t i = size_t(y) * stride;
+            twoSidedRow(normal.first + i, normal.second + i, mirrored.first + i, mirrored.second + i, coverage, W,
+                        g.gain, ReliefFirstColour(prop), ReliefSecondColour(prop), argb + i);
         }
     }
     ReliefDrawFrame(kEmbossVariant, frame, argb, pp->separateWorkImage, pp->dst, pp->extraDst);

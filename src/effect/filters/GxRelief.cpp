@@ -492,14 +492,6 @@ float ReliefIncidence(const GxReliefLight& light, float normalZ, float gx, float
 
 // ---- colouring
 
-GxReliefPalette::GxReliefPalette(float gain, uint32_t firstColour, uint32_t secondColour) {
-    for (int i = 0; i < 256; ++i) {
-        tone[i] = int(gain * float(i));  // ReliefTone's product, once per byte
-        firstTint[i] = ReliefTint(firstColour, i);
-        secondTint[i] = ReliefTint(secondColour, i);
-    }
-}
-
 void ReliefColourise(const unsigned char* first, const unsigned char* second, size_t count,
                      float gain, uint32_t firstColour, uint32_t secondColour, uint32_t* out) {
     const ReliefRows::ColouriseRow colourise = ReliefRows::Active().colourise;

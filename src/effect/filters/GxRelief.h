@@ -299,15 +299,6 @@ inline GxReliefTone ReliefTone(unsigned firstValue, unsigned secondValue, float 
     return {d < 0 ? -d : d, s > l};
 }
 
-// The colouring tabulated: tone[b] = int(gain * b) for every plane byte, and
-// each colour premultiplied by every alpha (ReliefTint).
-struct GxReliefPalette {
-    GxReliefPalette(float gain, uint32_t firstColour, uint32_t secondColour);
-    int tone[256];
-    uint32_t firstTint[256];
-    uint32_t secondTint[256];
-};
-
 // One pixel per plane byte: min(|s - l|, 255) in the winning colour,
 // premultiplied, as 0xAARRGGBB words.
 void ReliefColourise(const unsigned char* first, const unsigned char* second, size_t count,

@@ -115,6 +115,36 @@ inline uint32_t ColourPixel(uint8_t first, uint8_t second, float gain, uint32_t 
     return ReliefTint(tone.first ? firstColour : secondColour, alpha);
 }
 
+// ((difference + 1) * weight) >> 8, 255 when the product reaches 65536.
+inline int WeightedAlpha(int difference, int weight) {
+    const int product = (difference + 1) * weight;
+    return product >= 65536 ? 255 : product >> 8;
+}
+
+inline int Channel(uint32_t argb, int shift) { return int((argb >> shift) & 0xFF); }
+
+// The two-sided pixel: the normal relief (weight m) over the mirrored one.
+inline uint32_t TwoSidedPixel(uint8_t normalFirst, uint8_t normalSecond, uint8_t mirroredFirst,
+                              uint8_t mirroredSecond, int m, float gain, uint32_t firstColour,
+                              uint32_t secondColour) {
+    const GxReliefTone normal = ReliefTone(normalFirst, normalSecond, gain);
+    const GxReliefTone mirrored = ReliefTone(mirroredFirst, mirroredSecond, gain);
+    const int alpha1 = WeightedAlpha(normal.difference, m);
+    const int alpha2 = WeightedAlpha(mirrored.difference, 255 - m);
+    const uint32_t c1 = ReliefTint(normal.first ? firstColour : secondColour, alpha1);
+    const uint32_t c2 = ReliefTint(mirrored.first ? firstColour : secondColour, alpha2);
+    if (alpha1 == 0) return c2;
+    if (alpha1 == 255) return c1;
+    const int k = 255 - alpha1;
+    int alpha = alpha1 + ((k * (alpha2 + 1)) >> 8);
+    uint32_t out = uint32_t(alpha > 255 ? 255 : alpha) << 24;
+    for (int shift = 16; shift >= 0; shift -= 8) {
+        const int v = Channel(c1, shift) + ((k * (Channel(c2, shift) + 1)) >> 8);
+        out |= uint32_t(v > 255 ? 255 : v) << shift;
+    }
+    return out;
+}
+
 // The span of row y that the disc of a source at (x, sourceRow) covers, and
 // where its roots start.
 struct Span {
@@ -429,9 +459,71 @@ void Colourise(const uint8_t* HWY_RESTRICT first, const uint8_t* HWY_RESTRICT se
     for (; x < n; ++x) out[x] = Scalar::ColourPixel(first[x], second[x], gain, firstColour, secondColour);
 }
 
+#if HWY_TARGET != HWY_SCALAR
+// int(gain * b) of the lanes' bytes.
+HWY_INLINE VI Tone(DF df, VF gain, const uint8_t* bytes) {
+    const DI di;
+    return hn::ConvertTo(di, hn::Mul(gain, hn::ConvertTo(df, hn::PromoteTo(di, hn::LoadU(D8(), bytes)))));
+}
+
+// WeightedAlpha.
+HWY_INLINE VI Weighted(DI di, VI difference, VI weight) {
+    const VI product = hn::Mul(hn::Add(difference, hn::Set(di, 1)), weight);
+    return hn::IfThenElse(hn::Gt(product, hn::Set(di, 65535)), hn::Set(di, 255), hn::ShiftRight<8>(product));
+}
+#endif
+
+void TwoSided(const uint8_t* HWY_RESTRICT normalFirst, const uint8_t* HWY_RESTRICT normalSecond,
+              const uint8_t* HWY_RESTRICT mirroredFirst, const uint8_t* HWY_RESTRICT mirroredSecond,
+              const uint8_t* HWY_RESTRICT coverage, int n, float gain, uint32_t firstColour, uint32_t secondColour,
+              uint32_t* HWY_RESTRICT out) {
+    int x = 0;
+#if HWY_TARGET != HWY_SCALAR
+    const DF df;
+    const DI di;
+    const D8 d8;
+    const hn::RebindToUnsigned<DI> du;
+    const int N = int(hn::Lanes(df));
+    const VF g = hn::Set(df, gain);
+    const VI zero = hn::Zero(di);
+    const VI one = hn::Set(di, 1);
+    const VI most = hn::Set(di, 255);
+    for (; x + N <= n; x += N) {
+        const VI d1 = hn::Sub(Tone(df, g, normalFirst + x), Tone(df, g, normalSecond + x));
+        const VI d2 = hn::Sub(Tone(df, g, mirroredFirst + x), Tone(df, g, mirroredSecond + x));
+        const VI m = hn::PromoteTo(di, hn::LoadU(d8, coverage + x));
+        const VI alpha1 = Weighted(di, hn::Abs(d1), m);
+        const VI alpha2 = Weighted(di, hn::Abs(d2), hn::Sub(most, m));
+        const auto first1 = hn::Gt(d1, zero);
+        const auto first2 = hn::Gt(d2, zero);
+        const VI k = hn::Sub(most, alpha1);
+        VI c1 = hn::ShiftLeft<24>(alpha1);
+        VI c2 = hn::ShiftLeft<24>(alpha2);
+        VI blend = hn::ShiftLeft<24>(hn::Min(hn::Add(alpha1, hn::ShiftRight<8>(hn::Mul(k, hn::Add(alpha2, one)))), most));
+        for (int shift = 16; shift >= 0; shift -= 8) {
+            const VI firstChannel = hn::Set(di, int((firstColour >> shift) & 0xFF) + 1);
+            const VI secondChannel = hn::Set(di, int((secondColour >> shift) & 0xFF) + 1);
+            const VI tint1 = hn::Min(hn::ShiftRight<8>(hn::Mul(hn::IfThenElse(first1, firstChannel, secondChannel), alpha1)), most);
+            const VI tint2 = hn::Min(hn::ShiftRight<8>(hn::Mul(hn::IfThenElse(first2, firstChannel, secondChannel), alpha2)), most);
+            c1 = hn::Or(c1, hn::ShiftLeftSame(tint1, shift));
+            c2 = hn::Or(c2, hn::ShiftLeftSame(tint2, shift));
+            const VI mixed = hn::Min(hn::Add(tint1, hn::ShiftRight<8>(hn::Mul(k, hn::Add(tint2, one)))), most);
+            blend = hn::Or(blend, hn::ShiftLeftSame(mixed, shift));
+        }
+        VI word = hn::IfThenElse(hn::Eq(alpha1, most), c1, blend);
+        word = hn::IfThenElse(hn::Eq(alpha1, zero), c2, word);
+        hn::StoreU(hn::BitCast(du, word), du, out + x);
+    }
+#endif
+    for (; x < n; ++x) {
+        out[x] = Scalar::TwoSidedPixel(normalFirst[x], normalSecond[x], mirroredFirst[x], mirroredSecond[x],
+                                       coverage[x], gain, firstColour, secondColour);
+    }
+}
+
 const Table* GetTable() {
     static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, SweepSides, InwardRow,
-                                Colourise};
+                                Colourise, TwoSided};
     return &table;
 }
 
@@ -474,12 +566,20 @@ void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, u
                uint32_t secondColour, uint32_t* out) {
     for (int x = 0; x < n; ++x) out[x] = Scalar::ColourPixel(first[x], second[x], gain, firstColour, secondColour);
 }
+void TwoSided(const uint8_t* normalFirst, const uint8_t* normalSecond, const uint8_t* mirroredFirst,
+              const uint8_t* mirroredSecond, const uint8_t* coverage, int n, float gain, uint32_t firstColour,
+              uint32_t secondColour, uint32_t* out) {
+    for (int x = 0; x < n; ++x) {
+        out[x] = Scalar::TwoSidedPixel(normalFirst[x], normalSecond[x], mirroredFirst[x], mirroredSecond[x],
+                                       coverage[x], gain, firstColour, secondColour);
+    }
+}
 }  // namespace Reference
 
 const Table& ReferenceTable() {
     static const Table table = {Reference::BevelLight, Reference::EmbossHardLight, Reference::EmbossSoftLight,
                                 Reference::SweepSource, Reference::SweepSides, Reference::InwardRow,
-                                Reference::Colourise};
+                                Reference::Colourise, Reference::TwoSided};
     return table;
 }
 

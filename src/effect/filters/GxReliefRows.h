@@ -2,7 +2,7 @@
 // The row kernels of the relief layers (bevel, emboss): the lighting of a row
 // of the height field into the two wash planes, one source's sweep of the
 // local distance search, a row of the emboss's inward search, and the
-// colouring of the two washes.
+// colouring of the two washes (and of the emboss's two reliefs).
 //
 // Each is written once as the literal scalar loop (Reference) and once with
 // Highway, compiled for SSE4, AVX2 and AVX-512 on x86-64 and NEON on 64-bit
@@ -80,6 +80,13 @@ using InwardRow = void (*)(const float* sources, ptrdiff_t stride, int above, in
 using ColouriseRow = void (*)(const uint8_t* first, const uint8_t* second, int n, float gain,
                               uint32_t firstColour, uint32_t secondColour, uint32_t* out);
 
+// The emboss's two-sided colouring of n pixels: the normal relief's tone
+// (planes normalFirst, normalSecond) weighted by the coverage m, laid over the
+// mirrored one's weighted by 255 - m, premultiplied, as 0xAARRGGBB.
+using TwoSidedRow = void (*)(const uint8_t* normalFirst, const uint8_t* normalSecond, const uint8_t* mirroredFirst,
+                             const uint8_t* mirroredSecond, const uint8_t* coverage, int n, float gain,
+                             uint32_t firstColour, uint32_t secondColour, uint32_t* out);
+
 struct Table {
     BevelLightRow bevelLight;
     EmbossHardLightRow embossHardLight;
@@ -88,6 +95,7 @@ struct Table {
     SweepSides sweepSides;
     InwardRow inwardRow;
     ColouriseRow colourise;
+    TwoSidedRow twoSided;
 };
 
 namespace Reference {
@@ -103,6 +111,9 @@ void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int
                const float* cur, float* out, int n);
 void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, uint32_t firstColour,
                uint32_t secondColour, uint32_t* out);
+void TwoSided(const uint8_t* normalFirst, const uint8_t* normalSecond, const uint8_t* mirroredFirst,
+              const uint8_t* mirroredSecond, const uint8_t* coverage, int n, float gain, uint32_t firstColour,
+              uint32_t secondColour, uint32_t* out);
 }  // namespace Reference
 
 const Table& ReferenceTable();

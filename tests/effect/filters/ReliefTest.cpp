@@ -273,6 +273,12 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
         const uint32_t firstColour = rng(), secondColour = rng();
         std::vector<uint32_t> wantWords(size_t(n), 0xDEADBEEFu);
         reference.colourise(first.data(), second.data(), n, gain, firstColour, secondColour, wantWords.data());
+        const std::vector<uint8_t> mirroredFirst = bytes(size_t(n)), mirroredSecond = bytes(size_t(n));
+        std::vector<uint8_t> coverage = bytes(size_t(n));
+        for (size_t i = 0; i < coverage.size(); i += 3) coverage[i] = i % 2 ? 255 : 0;  // the two shortcuts
+        std::vector<uint32_t> wantTwoSided(size_t(n), 0xDEADBEEFu);
+        reference.twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(), coverage.data(),
+                           n, gain, firstColour, secondColour, wantTwoSided.data());
 
         for (const auto& v : variants) {
             std::vector<uint8_t> got[3][2];
@@ -296,6 +302,10 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
             std::vector<uint32_t> gotWords(size_t(n), 0xDEADBEEFu);
             v.table->colourise(first.data(), second.data(), n, gain, firstColour, secondColour, gotWords.data());
             ASSERT_TRUE(same(gotWords, wantWords)) << v.name << " colours width " << n;
+            std::vector<uint32_t> gotTwoSided(size_t(n), 0xDEADBEEFu);
+            v.table->twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(),
+                              coverage.data(), n, gain, firstColour, secondColour, gotTwoSided.data());
+            ASSERT_TRUE(same(gotTwoSided, wantTwoSided)) << v.name << " two-sided width " << n;
         }
     }
 }
