@@ -9,27 +9,36 @@
 //   - ReliefPartialBlur: the separable integer Gaussian (centre weight 100,
 //     weights rounded in single precision) over a rectangle of a byte plane,
 //     vertical pass into a row buffer, horizontal pass into the destination,
-//     both the shared row kernel of GxBlurRows.
+//     both the shared row kernel of GxBlurRows; tiles of columns whose taps
+//     all read 0 get their zeros without it.
 //     It writes only its rectangle; the rest of the destination keeps what it
 //     held, which the plane rotation below relies on.
 //   - ReliefDT1D / ReliefExactTransform: the lower-envelope squared Euclidean
 //     distance transform of a line, and of a whole field (columns first, then
-//     rows), in single precision with integer squares.
-//   - ReliefLocalDistance: the local search used for smaller reliefs. Every
-//     "target" pixel takes the smallest v + sqrt(dx^2 + dy^2) over the
-//     "source" pixels (value below 1.0) in its square window, the root read
-//     from the rounded square-root table. Because every improvement is at least
-//     1.0 it never creates a new source, so the sources can be indexed first
-//     and searched nearest-first; the literal scan is kept beside it as
-//     ReliefLocalDistanceReference and the two agree bit for bit.
+//     rows), in single precision with integer squares. The line-by-line
+//     literal form is kept as ReliefExactTransformReference; the transform in
+//     use leaves out the steps that provably change no bit on the fields of 0
+//     and far the layers build.
+//   - ReliefLocalDistance / ReliefInwardDistance: the local searches used for
+//     smaller reliefs (GxReliefSearch.cpp): every target pixel takes the best
+//     candidate, a value plus or minus sqrt(dx^2 + dy^2) from the rounded
+//     square-root table, over the source pixels of its square window. Their
+//     literal scans are kept beside them as the references; they agree bit
+//     for bit.
 //   - the light vector, the slope's lighting level, the edge factor that fades
 //     a wash out where the field reaches its range, the plane write
 //     ((amount >> 8) + 1) * edge >> 8, and the premultiplied colouring that
-//     keeps whichever wash is stronger.
+//     keeps whichever wash is stronger; by the row, with vector kernels, in
+//     GxReliefRows.
 //   - ReliefSmoothAndSoften: the blur passes over both planes with their buffer
 //     rotation. Each blur writes only its inner region, and the buffers are
 //     reused in a fixed order, so the outer strips of a plane may keep values
 //     of the other plane; that is the layers' established output and is kept.
+//
+// A render takes its memory from the stack's scratch when it has one (the
+// field and then the frame's words in kPlaneA, the planes and the blurs'
+// spare in kPlaneB, search planes in kPlaneC, rows and tables in kRows), so
+// renders of a size drawn before allocate nothing.
 //
 // The deliberate differences between the layers stay explicit: the coverage
 // divisor (254.99 bevel, 254.999 emboss), the depth floor of the normal (0.1,
@@ -178,7 +187,7 @@ enum class GxReliefTargets {
 
 // The local search over rows [y0, y1) of a width x height field, window
 // radius `radius` (GxReliefSearch.cpp tells how). With `scratch` its tables
-// come from the kRows slot. Returns 0 (every outcome).
+// come from the kRows and kPlaneC slots. Returns 0 (every outcome).
 int ReliefLocalDistance(float* field, int width, int height, int radius, int y0, int y1,
                         GxReliefTargets targets, GxScratch* scratch = nullptr);
 // The literal scan, rows outer and columns inner in increasing order, each
