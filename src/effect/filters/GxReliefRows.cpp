@@ -151,11 +151,11 @@ struct Span {
     int begin, end;
     const float* roots;
 };
-inline Span SweepSpanOf(int width, int x, int sourceRow, int y, bool left, bool right, const Disc& disc) {
+inline Span SweepSpanOf(int width, int x, int sourceRow, int y, int left, int right, const Disc& disc) {
     const int a = y > sourceRow ? y - sourceRow : sourceRow - y;
     const int chord = disc.chords[a];
-    const int from = left ? x - chord : x;
-    const int to = right ? x + chord + 1 : x + 1;
+    const int from = x - (left < chord ? left : chord);
+    const int to = x + (right < chord ? right : chord) + 1;
     const int begin = from > 0 ? from : 0;
     const int end = to < width ? to : width;
     return {begin, end, disc.roots[a] + (begin - x)};
@@ -352,7 +352,7 @@ HWY_INLINE bool SweepVectors(D d, float* HWY_RESTRICT out, const float* HWY_REST
 #endif
 
 void SweepSource(float* HWY_RESTRICT field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin,
-                 int rowEnd, bool left, bool right, const Disc& disc, float amount) {
+                 int rowEnd, int left, int right, const Disc& disc, float amount) {
     for (int y = rowBegin; y < rowEnd; ++y) {
         const Scalar::Span span = Scalar::SweepSpanOf(width, x, sourceRow, y, left, right, disc);
         float* out = field + ptrdiff_t(y) * stride + span.begin;
@@ -548,7 +548,7 @@ void EmbossSoftLight(const float* o, const float* in, ptrdiff_t stride, int n, c
     for (int x = 0; x < n; ++x) Scalar::EmbossSoftPixel(o + x, in + x, stride, light, second + x, first + x);
 }
 void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin, int rowEnd,
-                 bool left, bool right, const Disc& disc, float amount) {
+                 int left, int right, const Disc& disc, float amount) {
     for (int y = rowBegin; y < rowEnd; ++y) {
         const Scalar::Span span = Scalar::SweepSpanOf(width, x, sourceRow, y, left, right, disc);
         Scalar::SweepSpan(field + ptrdiff_t(y) * stride + span.begin, span.roots, span.end - span.begin, amount);

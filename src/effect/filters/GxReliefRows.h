@@ -45,8 +45,8 @@ using EmbossSoftLightRow = void (*)(const float* o, const float* in, ptrdiff_t s
 
 // One source of the local search, swept over the rows it reaches:
 // for each row y in [rowBegin, rowEnd), a = |y - sourceRow|, the columns
-// x - chords[a] .. x + chords[a] inside [0, width) (only from x on when not
-// `left`, only up to x when not `right`) become
+// x - min(chords[a], left) .. x + min(chords[a], right) inside [0, width)
+// become
 //     candidate < value ? candidate : value,   candidate = amount + roots[a][dx]
 // with roots[a] pointing at dx = 0 of that row's roots.
 struct Disc {
@@ -54,7 +54,7 @@ struct Disc {
     const float* const* roots;  // roots[a][dx] for |dx| <= chords[a]
 };
 using SweepSource = void (*)(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin,
-                             int rowEnd, bool left, bool right, const Disc& disc, float amount);
+                             int rowEnd, int left, int right, const Disc& disc, float amount);
 
 // Which sides of its disc each pixel of a row sweeps in the outward search,
 // for x in [1, n - 1): 0 unless row[x] < 1.0 (a source), else bit 0 when the
@@ -105,7 +105,7 @@ void EmbossHardLight(const float* f, ptrdiff_t stride, int n, const Light& light
 void EmbossSoftLight(const float* o, const float* in, ptrdiff_t stride, int n, const Light& light,
                      uint8_t* second, uint8_t* first);
 void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin, int rowEnd,
-                 bool left, bool right, const Disc& disc, float amount);
+                 int left, int right, const Disc& disc, float amount);
 void SweepSides(const float* above, const float* row, const float* below, int n, bool positive, uint8_t* sides);
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n);

@@ -23,16 +23,20 @@
 //     at most R(r^2 + 1), which every field the layers build satisfies (their
 //     far value is the radius). Other targets (hand-made fields) take the
 //     literal window scan first.
-//   - Only where no neighbour does better. Say a neighbour of a source
-//     serves when it is a source too, with an amount no larger (or lies
-//     outside the field). For a pixel p to the right of the source q, the
-//     right neighbour is nearer to p and no farther in either coordinate (so
-//     inside p's window and disc): if it serves, its candidate is no worse
-//     than q's, and q need not reach p. Likewise left, above and below. So q
-//     sweeps only the columns on the sides whose neighbour does not serve
-//     (and its own), times the rows likewise: nothing inside a glyph, a row
-//     or a half disc along its outline (induction on the distance shows every
-//     pixel still gets its best candidate from some sweep).
+//   - Only where no other source does better. Say a source q' serves q when
+//     its amount is no larger. If q' lies on q's row, k columns to the
+//     right, then for every pixel p in a column at or past q' it is nearer
+//     than q and no farther in either coordinate (so inside p's window and
+//     disc): its candidate is no worse, and q need not reach p. Likewise to
+//     the left, and up and down q's column (a pixel outside the field counts
+//     as serving). So q sweeps the columns short of the first serving source
+//     on each side of its row, times the rows short of the first above and
+//     below: nothing inside a glyph, a row or a half disc along its outline,
+//     a few pixels in a noisy mask (induction on the distance shows every
+//     pixel still gets its best candidate from some sweep). The adjacent
+//     neighbours are tested for a whole row at once by a vector kernel; a
+//     side they leave open is looked along for a few steps when the disc is
+//     large (a small one costs about what the look would).
 //   - Each swept row is one vector compare-and-select (GxReliefRows).
 //   Beyond kSweepRadius the disc tables grow too large and the older
 //   nearest-first gather serves (a summed-area table skips empty windows,
@@ -64,6 +68,11 @@ namespace {
 constexpr int kSweepRadius = 128;
 // Largest inward window gathered by vectors ((2r + 1)^2 roots).
 constexpr int kInwardRadius = 128;
+// Smallest radius whose sweeps look along an open side for a serving source,
+// and how far they look: a few steps find the next source of a noisy mask and
+// cost little beside a large disc.
+constexpr int kWalkRadius = 16;
+constexpr int kWalkSteps = 4;
 // Vector lanes the inward plane is padded for (AVX-512 floats).
 constexpr int kLanePadding = 16;
 
@@ -96,6 +105,21 @@ float TableRoot(int64_t i) {
 inline int ClampRadius(int radius, int width, int height) {
     int largest = width > height ? width : height;
     return radius > largest ? largest : radius;
+}
+
+// How far the sweep of the source at (x, y) reaches in the direction
+// (dx, dy): r, or short of a serving source found within kWalkSteps. Kept
+// out of line: the loop over a row's pixels stays small.
+[[gnu::noinline]] int Reach(const float* field, int width, int height, int x, int y, int dx, int dy, int r, float amount,
+          bool positive) {
+    for (int steps = 1; steps <= kWalkSteps; ++steps) {
+        x += dx;
+        y += dy;
+        if (x < 0 || x >= width || y < 0 || y >= height) break;
+        const float n = field[size_t(y) * size_t(width) + size_t(x)];
+        if (n < 1.0f && (positive && !(n > 0.0f) ? 0.0f : n) <= amount) return steps - 1;
+    }
+    return r;
 }
 
 // The literal scan of one target at (x, y), as ReliefLocalDistanceReference
@@ -374,12 +398,25 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
         for (int x = 0; x < width; ++x) {
             const int bits = sides[x];
             if (bits == 0) continue;
-            const int top = bits & 4 ? j - r : j;
-            const int bottom = bits & 8 ? int(int64_t(j) + r + 1) : j + 1;
+            const float amount = amountOf(row[x]);
+            // How far each side reaches: to the radius, or short of the first
+            // source on that line that serves (nearer to everything past it),
+            // looked for a few steps out when the disc is large.
+            int left = bits & 1 ? r : 0;
+            int right = bits & 2 ? r : 0;
+            int up = bits & 4 ? r : 0;
+            int down = bits & 8 ? r : 0;
+            if (r >= kWalkRadius) {
+                if (left) left = Reach(field, width, height, x, j, -1, 0, r, amount, positive);
+                if (right) right = Reach(field, width, height, x, j, 1, 0, r, amount, positive);
+                if (up) up = Reach(field, width, height, x, j, 0, -1, r, amount, positive);
+                if (down) down = Reach(field, width, height, x, j, 0, 1, r, amount, positive);
+            }
+            const int top = j - up;
+            const int bottom = int(int64_t(j) + down + 1);
             const int begin = top > y0 ? top : y0;
             const int end = bottom < y1 ? bottom : y1;
-            if (begin < end)
-                sweep(field, ptrdiff_t(stride), width, x, j, begin, end, bits & 1, bits & 2, disc, amountOf(row[x]));
+            if (begin < end) sweep(field, ptrdiff_t(stride), width, x, j, begin, end, left, right, disc, amount);
         }
     }
     return 0;

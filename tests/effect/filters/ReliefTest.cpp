@@ -244,7 +244,7 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
         const int rows = 2 * r + 1;
         const std::vector<float> swept = heights(size_t(n) * rows, float(r));
         const int sourceX = int(rng() % 3) == 0 ? 0 : int(rng() % n);
-        const bool left = rng() % 4 != 0, right = rng() % 4 != 0;
+        const int left = int(rng() % (r + 2)), right = rng() % 4 == 0 ? 0 : r;
         const float amount = float(rng() % 100) / 101.0f;
         std::vector<float> wantSwept = swept;
         reference.sweepSource(wantSwept.data(), n, n, sourceX, r, 0, rows, left, right, disc, amount);
