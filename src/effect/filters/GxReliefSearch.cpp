@@ -362,7 +362,7 @@ int ReliefLocalDistance(float* field, int width, int height, int radius, int y0,
     }
     const ReliefRows::Disc disc{chords, rootRows};
 
-    // Every source sweeps the part of its disc that no neighbour serves. Per
+    // Every source sweeps the part of its disc no other source serves. Per
     // row, branch-free (it vectorises): which sides each pixel sweeps, as bits
     // (0: not a source, or served on every side). Outside the field a row of
     // -infinity stands in: a source with an amount below any.
