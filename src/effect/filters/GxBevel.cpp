@@ -167,7 +167,9 @@ void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
             for (int x = M; x <= last; ++x)
                 if (bytes[x - M] != 0) row[x] = glyphValue;
         }
-        if (!ReliefExactTransform(field, W, H, scratch)) return;
+        // Past the range every value becomes the range: the transform is
+        // needed exactly only up to range^2.
+        if (!ReliefExactTransformNear(field, W, H, g.range, scratch)) return;
         const float rangeSquared = float(int64_t(g.range) * g.range);
         for (size_t i = 0; i < N; ++i) {
             const float v = field[i];

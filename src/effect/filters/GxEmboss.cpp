@@ -234,7 +234,15 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
                 in[x] = kFar;
             }
         }
-        if (!ReliefExactTransform(outer, W, H, scratch) || !ReliefExactTransform(inner, W, H, scratch)) return;
+        // The soft lighting reads a distance where it lies strictly between 0
+        // and its range, and at the four neighbours of such a pixel. fsqrt is
+        // within 0.2 % of the root, so a squared distance past (range + 2)^2
+        // never passes for one below the range, and those neighbours lie
+        // within range + 2: the transforms are needed exactly only that far.
+        if (!ReliefExactTransformNear(outer, W, H, g.outRange + 2, scratch) ||
+            !ReliefExactTransformNear(inner, W, H, g.inRange + 2, scratch)) {
+            return;
+        }
         for (size_t i = 0; i < N; ++i) {
             outer[i] = outer[i] >= 0.0f ? fsqrt(outer[i]) : 0.0f;
             inner[i] = inner[i] >= 0.0f ? fsqrt(inner[i]) : 0.0f;

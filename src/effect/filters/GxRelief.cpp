@@ -1,5 +1,6 @@
 #include "effect/filters/GxRelief.h"
 
+#include <bit>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
@@ -294,8 +295,9 @@ bool ReliefExactTransformReference(float* field, int width, int height) {
 
 namespace {
 
-// Longest side of a field the fast transform takes (see below).
+// Longest side of a field the fast transforms take (see below).
 constexpr int kFastTransformSide = 4096;
+constexpr int kNearTransformSide = 2048;
 
 // ReliefDT1D over the entries other than kFar, their positions kept; a line
 // of kFar alone gives kFar throughout.
@@ -377,56 +379,110 @@ void NearestZero(float* line, int n) {
 //     sweeps give. Every column of the first pass is such a line, as is every
 //     row of the second that holds only 0 and kFar.
 // Other rows take the envelope without their kFar entries.
-bool ReliefExactTransform(float* field, int width, int height, GxScratch* scratch) {
-    if (field == nullptr || width <= 0 || height <= 0) return true;
+namespace {
+
+// The column pass on a field of 0 and kFar: the squared distance to the
+// nearest 0 of the column, kFar where it has none. `last` holds width ints.
+void NearestZeroColumns(float* field, int width, int height, int* last) {
+    // In 32-bit ints, the first pass keeping its distance in the float's bits
+    // (a compare of bits and a select: that loop vectorises).
     const size_t stride = size_t(width);
-    const size_t pixels = stride * size_t(height);
-    bool binary = width <= kFastTransformSide && height <= kFastTransformSide;
-    for (size_t i = 0; binary && i < pixels; ++i) binary = field[i] == 0.0f || field[i] == kFar;
-    if (!binary) return ReliefExactTransformReference(field, width, height);
-
-    GxReliefBuffer memory(scratch, GxScratch::kRows);
-    auto* words = memory.get<int32_t>(3 * stride + 1);
-    if (words == nullptr) return false;
-    auto* last = words;           // per column: the row of the last 0 above
-    int* v = words + stride;      // the envelope of a row
-    auto* z = reinterpret_cast<float*>(words + 2 * stride);
-    static_assert(sizeof(float) == sizeof(int32_t));
-
-    // Columns: the distance to the last 0 above, then, from below, the nearest.
     constexpr int kNone = 1 << 30;
     for (size_t x = 0; x < stride; ++x) last[x] = -kNone;
-    for (int y = 0; y < height; ++y) {
+    for (int y = 0; y < height; ++y) {  // the distance to the last 0 above, at most kNone
         float* row = field + size_t(y) * stride;
         for (size_t x = 0; x < stride; ++x) {
-            if (row[x] == 0.0f) last[x] = y;
-            const int up = y - last[x];
-            row[x] = float(up < kNone ? up : kNone);
+            const int at = std::bit_cast<int32_t>(row[x]) == 0 ? y : last[x];
+            last[x] = at;
+            const int up = y - at;
+            row[x] = std::bit_cast<float>(int32_t(up < kNone ? up : kNone));
         }
     }
     for (size_t x = 0; x < stride; ++x) last[x] = kNone + height;  // now: the next 0 below
     for (int y = height - 1; y >= 0; --y) {
         float* row = field + size_t(y) * stride;
         for (size_t x = 0; x < stride; ++x) {
-            if (row[x] == 0.0f) last[x] = y;
-            const int64_t up = int64_t(row[x]);
-            const int64_t down = int64_t(last[x]) - y;
-            const int64_t nearest = up < down ? up : down;
+            const int up = std::bit_cast<int32_t>(row[x]);
+            const int at = up == 0 ? y : last[x];
+            last[x] = at;
+            const int down = at - y;
+            const int nearest = up < down ? up : down;
             row[x] = nearest < height ? float(nearest * nearest) : kFar;
         }
     }
-    // Rows.
-    auto* line = reinterpret_cast<float*>(last);  // the columns are done with it
+}
+
+// Every value 0 (+0: the column pass reads its bits) or kFar.
+bool ZeroOrFar(const float* values, size_t n) {
+    bool all = true;
+    for (size_t i = 0; i < n; ++i) all &= std::bit_cast<int32_t>(values[i]) == 0 || values[i] == kFar;
+    return all;
+}
+
+}  // namespace
+
+bool ReliefExactTransform(float* field, int width, int height, GxScratch* scratch) {
+    if (field == nullptr || width <= 0 || height <= 0) return true;
+    const size_t stride = size_t(width);
+    if (width > kFastTransformSide || height > kFastTransformSide || !ZeroOrFar(field, stride * size_t(height)))
+        return ReliefExactTransformReference(field, width, height);
+
+    GxReliefBuffer memory(scratch, GxScratch::kRows);
+    auto* words = memory.get<int32_t>(3 * stride + 1);
+    if (words == nullptr) return false;
+    int* v = words + stride;  // the envelope of a row
+    auto* z = reinterpret_cast<float*>(words + 2 * stride);
+    static_assert(sizeof(float) == sizeof(int32_t));
+    NearestZeroColumns(field, width, height, words);
+    auto* line = reinterpret_cast<float*>(words);  // the columns are done with it
     for (int y = 0; y < height; ++y) {
         float* row = field + size_t(y) * stride;
-        bool zeroOrFar = true;
-        for (size_t x = 0; x < stride; ++x) zeroOrFar &= row[x] == 0.0f || row[x] == kFar;
-        if (zeroOrFar) {
+        if (ZeroOrFar(row, stride)) {
             NearestZero(row, width);
         } else {
             std::memcpy(line, row, sizeof(float) * stride);
             EnvelopeOfNear(line, row, width, v, z);
         }
+    }
+    return true;
+}
+
+// Within a reach. On rows of up to 2048 entries with values and squares below
+// 2^24, the float envelope gives the true minimum min_q f[q] + (p - q)^2:
+//   - each boundary s = (F_q - F_v) / 2(q - v) is the correctly rounded
+//     quotient of exact integers (F = f + q^2 is exact), so rounding keeps
+//     every order: where the exact walk pops a parabola, the float walk does
+//     too, and consecutive boundaries kept are increasing in exact terms;
+//   - an exact boundary N / D (D <= 4094) is an integer or at least
+//     1 / 4094 > 2^-12 away from every integer, while rounding moves a value
+//     below 2048 by at most 2^-14: no rounded boundary crosses an integer
+//     position. So the final walk gives each position the parabola the exact
+//     envelope gives it (at an exact tie either: same value), and a parabola
+//     the float walk pops where the exact one would not is one whose exact
+//     stretch, shorter than a rounding step, holds no position.
+// So the second pass is the true minimum, and wherever that is at most
+// reach^2 its minimising column lies within reach: the minimum over the
+// 2 reach + 1 nearest columns. Elsewhere that minimum is larger than reach^2
+// too (or kFar), which is all the layers ask of those pixels.
+bool ReliefExactTransformNear(float* field, int width, int height, int reach, GxScratch* scratch) {
+    if (field == nullptr || width <= 0 || height <= 0) return true;
+    const size_t stride = size_t(width);
+    if (width > kNearTransformSide || height > kNearTransformSide || reach < 0 || reach > kMaxFilterRadius ||
+        !ZeroOrFar(field, stride * size_t(height))) {
+        return ReliefExactTransform(field, width, height, scratch);
+    }
+    const size_t padded = stride + 2 * size_t(reach);
+    GxReliefBuffer memory(scratch, GxScratch::kRows);
+    auto* words = memory.get<int32_t>(stride + padded);
+    if (words == nullptr) return false;
+    NearestZeroColumns(field, width, height, words);
+    auto* line = reinterpret_cast<float*>(words + stride);
+    for (size_t i = 0; i < size_t(reach); ++i) line[i] = line[padded - 1 - i] = kFar;
+    const ReliefRows::NearRow nearRow = ReliefRows::Active().nearRow;
+    for (int y = 0; y < height; ++y) {
+        float* row = field + size_t(y) * stride;
+        std::memcpy(line + reach, row, sizeof(float) * stride);
+        nearRow(line + reach, reach, width, row);
     }
     return true;
 }

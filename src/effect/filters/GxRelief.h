@@ -178,6 +178,9 @@ void ReliefDT1D(const float* f, float* d, int n, int* v, float* z);
 bool ReliefExactTransform(float* field, int width, int height, GxScratch* scratch = nullptr);
 // The same, line by line through ReliefDT1D: what the above must give.
 bool ReliefExactTransformReference(float* field, int width, int height);
+// The transform wherever it is at most reach^2, bit for bit; elsewhere some
+// value above reach^2. For the layers, which need no more.
+bool ReliefExactTransformNear(float* field, int width, int height, int reach, GxScratch* scratch = nullptr);
 
 // What counts as a pixel to improve in the local search.
 enum class GxReliefTargets {

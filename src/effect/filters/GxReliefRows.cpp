@@ -108,6 +108,18 @@ inline uint8_t SidesOf(float above, float left, float v, float right, float belo
     return uint8_t(fails(left) | fails(right) << 1 | fails(above) << 2 | fails(below) << 3);
 }
 
+inline float NearPixel(const float* line, int radius) {
+    float best = line[0];
+    for (int dx = 1; dx <= radius; ++dx) {
+        const float square = float(dx * dx);
+        const float left = line[-dx] + square;
+        const float right = line[dx] + square;
+        if (left < best) best = left;
+        if (right < best) best = right;
+    }
+    return best;
+}
+
 inline uint32_t ColourPixel(uint8_t first, uint8_t second, float gain, uint32_t firstColour,
                             uint32_t secondColour) {
     const GxReliefTone tone = ReliefTone(first, second, gain);
@@ -399,6 +411,26 @@ void SweepSides(const float* HWY_RESTRICT above, const float* HWY_RESTRICT row, 
     for (; x + 1 < n; ++x) sides[x] = Scalar::SidesOf(above[x], row[x - 1], row[x], row[x + 1], below[x], positive);
 }
 
+void NearRow(const float* HWY_RESTRICT line, int radius, int n, float* HWY_RESTRICT out) {
+    int x = 0;
+#if HWY_TARGET != HWY_SCALAR
+    const DF df;
+    const int N = int(hn::Lanes(df));
+    for (; x + N <= n; x += N) {
+        VF best = hn::LoadU(df, line + x);
+        for (int dx = 1; dx <= radius; ++dx) {
+            const VF square = hn::Set(df, float(dx * dx));
+            const VF left = hn::Add(hn::LoadU(df, line + x - dx), square);
+            const VF right = hn::Add(hn::LoadU(df, line + x + dx), square);
+            best = hn::IfThenElse(hn::Lt(left, best), left, best);
+            best = hn::IfThenElse(hn::Lt(right, best), right, best);
+        }
+        hn::StoreU(best, df, out + x);
+    }
+#endif
+    for (; x < n; ++x) out[x] = Scalar::NearPixel(line + x, radius);
+}
+
 void InwardRow(const float* HWY_RESTRICT sources, ptrdiff_t stride, int above, int below, int radius,
                const float* HWY_RESTRICT roots, const float* HWY_RESTRICT cur, float* HWY_RESTRICT out, int n) {
     int x = 0;
@@ -522,8 +554,8 @@ void TwoSided(const uint8_t* HWY_RESTRICT normalFirst, const uint8_t* HWY_RESTRI
 }
 
 const Table* GetTable() {
-    static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, SweepSides, InwardRow,
-                                Colourise, TwoSided};
+    static const Table table = {BevelLight, EmbossHardLight, EmbossSoftLight, SweepSource, SweepSides, NearRow,
+                                InwardRow, Colourise, TwoSided};
     return &table;
 }
 
@@ -558,6 +590,9 @@ void SweepSides(const float* above, const float* row, const float* below, int n,
     for (int x = 1; x + 1 < n; ++x)
         sides[x] = Scalar::SidesOf(above[x], row[x - 1], row[x], row[x + 1], below[x], positive);
 }
+void NearRow(const float* line, int radius, int n, float* out) {
+    for (int x = 0; x < n; ++x) out[x] = Scalar::NearPixel(line + x, radius);
+}
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n) {
     for (int x = 0; x < n; ++x) out[x] = Scalar::InwardPixel(sources + x, stride, above, below, radius, roots, cur[x]);
@@ -578,8 +613,8 @@ void TwoSided(const uint8_t* normalFirst, const uint8_t* normalSecond, const uin
 
 const Table& ReferenceTable() {
     static const Table table = {Reference::BevelLight, Reference::EmbossHardLight, Reference::EmbossSoftLight,
-                                Reference::SweepSource, Reference::SweepSides, Reference::InwardRow,
-                                Reference::Colourise, Reference::TwoSided};
+                                Reference::SweepSource, Reference::SweepSides, Reference::NearRow,
+                                Reference::InwardRow, Reference::Colourise, Reference::TwoSided};
     return table;
 }
 

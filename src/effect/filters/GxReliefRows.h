@@ -65,6 +65,11 @@ using SweepSource = void (*)(float* field, ptrdiff_t stride, int width, int x, i
 using SweepSides = void (*)(const float* above, const float* row, const float* below, int n, bool positive,
                             uint8_t* sides);
 
+// The exact transform's rows within a reach: for x in [0, n),
+// out[x] = min over |dx| <= radius of line[x + dx] + dx^2 (`radius` readable
+// entries on either side of the row).
+using NearRow = void (*)(const float* line, int radius, int n, float* out);
+
 // A row of the emboss's inward search: for x in [0, n) with cur[x] < 0,
 // out[x] = the largest of cur[x] and every sources[x + dx + a * stride] -
 // roots[(a + radius) * (2 * radius + 1) + dx + radius] (kept only when
@@ -93,6 +98,7 @@ struct Table {
     EmbossSoftLightRow embossSoftLight;
     SweepSource sweepSource;
     SweepSides sweepSides;
+    NearRow nearRow;
     InwardRow inwardRow;
     ColouriseRow colourise;
     TwoSidedRow twoSided;
@@ -107,6 +113,7 @@ void EmbossSoftLight(const float* o, const float* in, ptrdiff_t stride, int n, c
 void SweepSource(float* field, ptrdiff_t stride, int width, int x, int sourceRow, int rowBegin, int rowEnd,
                  int left, int right, const Disc& disc, float amount);
 void SweepSides(const float* above, const float* row, const float* below, int n, bool positive, uint8_t* sides);
+void NearRow(const float* line, int radius, int n, float* out);
 void InwardRow(const float* sources, ptrdiff_t stride, int above, int below, int radius, const float* roots,
                const float* cur, float* out, int n);
 void Colourise(const uint8_t* first, const uint8_t* second, int n, float gain, uint32_t firstColour,

@@ -100,11 +100,20 @@ TEST(ReliefKernels, DistanceTransformsAgainstBruteForce) {
                 if (trial % 4 == 1 && (x % 11 == 3 || y % 9 == 2)) zero = trial % 8 == 1;  // whole lines alike
                 fast[size_t(y) * w + x] = (zero != (trial % 2 == 0)) ? 0.0f : kFar;
             }
-        std::vector<float> slow = fast;
+        std::vector<float> slow = fast, near = fast;
+        const int reach = int(rng() % 12);
         ASSERT_TRUE(ReliefExactTransform(fast.data(), w, h));
+        ASSERT_TRUE(ReliefExactTransformNear(near.data(), w, h, reach));
         ASSERT_TRUE(ReliefExactTransformReference(slow.data(), w, h));
         ASSERT_EQ(std::memcmp(fast.data(), slow.data(), fast.size() * sizeof(float)), 0) << w << "x" << h;
+        const float most = float(reach * reach);
+        for (size_t i = 0; i < slow.size(); ++i)
+            ASSERT_TRUE(slow[i] <= most ? near[i] == slow[i] : near[i] > most) << w << "x" << h << " at " << i;
     }
+    // What the emboss relies on to transform only that far: fsqrt stays within
+    // 0.2 % of the root of every squared distance a frame can hold.
+    for (int v = 1; v < (1 << 23); v += 1 + v / 4096)
+        ASSERT_TRUE(std::fabs(fsqrt(float(v)) - std::sqrt(float(v))) < 0.002f * std::sqrt(float(v))) << v;
     const int w = 17, h = 11;
     std::vector<float> field(w * h);
     for (float& v : field) v = rng() % 9 == 0 ? 0.0f : kFar;
@@ -256,6 +265,13 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
         reference.sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive,
                              wantSides.data());
 
+        // A row of squared column distances and far entries, within a reach.
+        const int reach = int(rng() % 13);
+        std::vector<float> squares(size_t(n) + 2 * size_t(reach));
+        for (float& v : squares) v = rng() % 5 == 0 ? 1e20f : float((rng() % 40) * (rng() % 40));
+        std::vector<float> wantNear(size_t(n), 7.0f);
+        reference.nearRow(squares.data() + reach, reach, n, wantNear.data());
+
         // The inward row: a padded plane of sources (values above 1 or -inf).
         const int ir = int(rng() % 5);
         const size_t plane = size_t(n) + 2 * size_t(ir);
@@ -296,6 +312,9 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
             v.table->sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive,
                                 gotSides.data());
             ASSERT_TRUE(same(gotSides, wantSides)) << v.name << " sides width " << n;
+            std::vector<float> gotNear(size_t(n), 7.0f);
+            v.table->nearRow(squares.data() + reach, reach, n, gotNear.data());
+            ASSERT_TRUE(same(gotNear, wantNear)) << v.name << " near width " << n;
             std::vector<float> gotInward(size_t(n), 7.0f);
             v.table->inwardRow(centre, ptrdiff_t(plane), ir, ir, ir, windowRoots.data(), cur.data(), gotInward.data(), n);
             ASSERT_TRUE(same(gotInward, wantInward)) << v.name << " inward width " << n;
