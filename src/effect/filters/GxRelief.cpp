@@ -87,32 +87,36 @@ void* GxReliefBuffer::bytes(size_t n) {
 
 namespace {
 
-// Columns per tile of the blur's zero test.
+// Columns per tile of the blur's constant test.
 constexpr int kBlurTile = 32;
+// A tile of mixed bytes.
+constexpr int16_t kMixed = -1;
 
-bool AnyNonZero(const unsigned char* p, size_t n) {
-    uint64_t any = 0;
+// The byte every one of p[0 .. n) holds, or kMixed.
+int16_t UniformByte(const unsigned char* p, size_t n) {
+    const uint64_t pattern = uint64_t(p[0]) * 0x0101010101010101ull;
+    uint64_t differ = 0;
     size_t i = 0;
     for (; i + 8 <= n; i += 8) {
         uint64_t word;
         std::memcpy(&word, p + i, 8);
-        any |= word;
+        differ |= word ^ pattern;
     }
-    for (; i < n; ++i) any |= p[i];
-    return any != 0;
+    for (; i < n; ++i) differ |= p[i] ^ p[0];
+    return differ == 0 ? int16_t(p[0]) : kMixed;
 }
 
-// Calls `run(begin, end, active)` for the maximal runs of tiles alike in
-// `active`, as columns clipped to [x0, x1).
+// Calls `run(begin, end, value)` for the maximal runs of tiles alike in
+// `value` (a byte, or kMixed), as columns clipped to [x0, x1).
 template <typename Run>
-void ForEachRun(const unsigned char* active, int tiles, int x0, int x1, Run run) {
+void ForEachRun(const int16_t* value, int tiles, int x0, int x1, Run run) {
     int t = x0 / kBlurTile;
     while (t < tiles && t * kBlurTile < x1) {
         int u = t + 1;
-        while (u < tiles && u * kBlurTile < x1 && active[u] == active[t]) ++u;
+        while (u < tiles && u * kBlurTile < x1 && value[u] == value[t]) ++u;
         const int begin = t * kBlurTile > x0 ? t * kBlurTile : x0;
         const int end = u * kBlurTile < x1 ? u * kBlurTile : x1;
-        run(begin, end, active[t] != 0);
+        run(begin, end, value[t]);
         t = u;
     }
 }
@@ -135,18 +139,20 @@ int ReliefPartialBlur(void* raw) {
     // the zeroed first and last `radius` bytes of a stride-long row. Columns
     // outside [x0, x1) are never written and stay 0.
     //
-    // Planes are mostly empty around the text. A blur of zeros is zero, so a
-    // tile of columns whose every tap reads 0 gets its zeros without the
-    // kernel: per source row, whether each tile holds anything; down the
-    // columns, how many of the 2R + 1 rows of the window do; along the row,
-    // whether a tile within R columns is non-zero.
+    // Planes are mostly empty around the text and flat inside it (or flat
+    // around it, inside a bevel). A blur of a constant is that constant (the
+    // sum is c * S, divided by S), so a tile of columns whose every tap reads
+    // the same byte gets it without the kernel: per source row, the byte each
+    // tile holds throughout, if any; down the columns, how many rows in a row
+    // held the same one (2R + 1 make the vertical pass constant); along the
+    // row, whether every tile within R columns is that constant, and so is
+    // the zero padding where the reach leaves [x0, x1).
     const int tiles = int((stride + kBlurTile - 1) / kBlurTile);
     const int firstRow = job->y0 - radius;
-    const size_t rows = size_t(job->y1 - job->y0) + 2 * size_t(radius);
     const size_t paddedBytes = stride + 2 * size_t(radius);
-    const size_t flagBytes = rows * size_t(tiles);
+    const size_t tileBytes = sizeof(int16_t) * size_t(tiles);
     const size_t countBytes = sizeof(int) * size_t(tiles);
-    const size_t bytes = countBytes + paddedBytes + flagBytes + 2 * size_t(tiles);
+    const size_t bytes = countBytes + 4 * tileBytes + paddedBytes;
     unsigned char* memory = nullptr;
     FreeOnExit freeMemory{nullptr};
     if (job->scratch != nullptr) {
@@ -156,56 +162,57 @@ int ReliefPartialBlur(void* raw) {
         freeMemory.pointer = memory;
     }
     if (memory == nullptr) return -1;
-    int* counts = reinterpret_cast<int*>(memory);  // aligned as the block is
-    unsigned char* row = memory + countBytes + radius;
-    unsigned char* flags = memory + countBytes + paddedBytes;
-    unsigned char* columnActive = flags + flagBytes;
-    unsigned char* rowActive = columnActive + tiles;
-    for (size_t j = 0; j < rows; ++j) {
+    int* runs = reinterpret_cast<int*>(memory);  // aligned as the block is
+    auto* entering = reinterpret_cast<int16_t*>(memory + countBytes);
+    int16_t* held = entering + tiles;       // the value of each tile's run of rows
+    int16_t* columns = held + tiles;        // the vertical pass's constant tiles
+    int16_t* along = columns + tiles;       // the horizontal pass's
+    unsigned char* row = memory + countBytes + 4 * tileBytes + radius;
+
+    auto enter = [&](size_t j) {  // source row firstRow + j joins the window
         const unsigned char* line = job->src + (ptrdiff_t(firstRow) + ptrdiff_t(j)) * ptrdiff_t(stride);
         for (int t = 0; t < tiles; ++t) {
             const size_t from = size_t(t) * kBlurTile;
             const size_t n = stride - from < size_t(kBlurTile) ? stride - from : size_t(kBlurTile);
-            flags[j * tiles + size_t(t)] = AnyNonZero(line + from, n);
+            const int16_t v = UniformByte(line + from, n);
+            runs[t] = v == kMixed ? 0 : (v == held[t] ? runs[t] + 1 : 1);
+            held[t] = v;
         }
-    }
-    for (int t = 0; t < tiles; ++t) counts[t] = 0;
-    for (size_t j = 0; j + 1 < size_t(2 * radius + 1); ++j)
-        for (int t = 0; t < tiles; ++t) counts[t] += flags[j * tiles + size_t(t)];
+    };
+    for (int t = 0; t < tiles; ++t) held[t] = kMixed;
+    for (size_t j = 0; j < size_t(2 * radius); ++j) enter(j);
 
     const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
     const int reach = (radius + kBlurTile - 1) / kBlurTile;
     for (int y = job->y0; y < job->y1; ++y) {
-        // Rows y - R .. y + R are flag rows y - y0 .. y - y0 + 2R.
-        const size_t top = size_t(y - job->y0);
-        const unsigned char* entering = flags + (top + 2 * size_t(radius)) * tiles;
-        for (int t = 0; t < tiles; ++t) {
-            counts[t] += entering[t];
-            columnActive[t] = counts[t] > 0;
-        }
+        enter(size_t(y - job->y0) + 2 * size_t(radius));  // row y + R
+        for (int t = 0; t < tiles; ++t) columns[t] = runs[t] >= 2 * radius + 1 ? held[t] : kMixed;
         const unsigned char* centre = job->src + ptrdiff_t(y) * ptrdiff_t(stride);
-        ForEachRun(columnActive, tiles, x0, x1, [&](int begin, int end, bool active) {
-            if (active) {
+        ForEachRun(columns, tiles, x0, x1, [&](int begin, int end, int16_t value) {
+            if (value == kMixed) {
                 blur(centre + begin, ptrdiff_t(stride), end - begin, gaussian, false, row + begin);
             } else {
-                std::memset(row + begin, 0, size_t(end - begin));
+                std::memset(row + begin, value, size_t(end - begin));
             }
         });
         for (int t = 0; t < tiles; ++t) {
-            unsigned char any = 0;
-            for (int u = t - reach > 0 ? t - reach : 0; u <= t + reach && u < tiles; ++u) any |= columnActive[u];
-            rowActive[t] = any;
+            // The taps of tile t: columns t * T - R .. (t + 1) * T - 1 + R.
+            int16_t value = columns[t];
+            const int64_t from = int64_t(t) * kBlurTile - radius;
+            const int64_t to = int64_t(t + 1) * kBlurTile - 1 + radius;
+            if (value > 0 && (from < x0 || to >= x1)) value = kMixed;  // reaches the zero padding
+            for (int u = t - reach; u <= t + reach && value != kMixed; ++u)
+                if (u >= 0 && u < tiles && columns[u] != value) value = kMixed;
+            along[t] = value;
         }
         unsigned char* out = job->dst + ptrdiff_t(y) * ptrdiff_t(stride);
-        ForEachRun(rowActive, tiles, x0, x1, [&](int begin, int end, bool active) {
-            if (active) {
+        ForEachRun(along, tiles, x0, x1, [&](int begin, int end, int16_t value) {
+            if (value == kMixed) {
                 blur(row + begin, 1, end - begin, gaussian, false, out + begin);
             } else {
-                std::memset(out + begin, 0, size_t(end - begin));
+                std::memset(out + begin, value, size_t(end - begin));
             }
         });
-        const unsigned char* leaving = flags + top * tiles;
-        for (int t = 0; t < tiles; ++t) counts[t] -= leaving[t];
     }
     return 0;
 }

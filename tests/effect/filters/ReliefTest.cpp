@@ -37,17 +37,19 @@ TEST(ReliefKernels, BlurByHandAndAgainstTheFormula) {
     EXPECT_EQ(dst, want);
 
     std::mt19937 rng(7);
-    // Dense planes, and wide sparse ones (empty tiles of columns are passed over).
-    struct Plane { int r, w, h; bool sparse; };
-    for (Plane p : {Plane{2, 13, 10, false}, Plane{5, 19, 16, false}, Plane{16, 41, 38, false},
-                    Plane{3, 150, 12, true}, Plane{9, 230, 40, true}}) {
+    // Dense planes, and wide ones of flat patches (tiles of columns that read
+    // one byte throughout are passed over): zeros, and other constants.
+    struct Plane { int r, w, h, flat; };
+    for (Plane p : {Plane{2, 13, 10, -1}, Plane{5, 19, 16, -1}, Plane{16, 41, 38, -1}, Plane{3, 150, 12, 0},
+                    Plane{9, 230, 40, 0}, Plane{0, 99, 9, 77}, Plane{1, 180, 30, 77}, Plane{7, 300, 45, 200}}) {
         const int r = p.r, w = p.w, h = p.h;
         std::vector<uint8_t> in(size_t(w) * h), out(in.size(), 0), ref(in.size(), 0);
         for (auto& v : in) v = uint8_t(rng() % 4 == 0 ? 255 : rng() % 256);
-        if (p.sparse) {
+        if (p.flat >= 0) {
             for (int y = 0; y < h; ++y)
                 for (int x = 0; x < w; ++x)
-                    if ((x / 23 + y / 7) % 3 != 0) in[y * w + x] = 0;
+                    if (!(x > w / 3 && x < w / 2 && y % 5 < 2) && (x / 23 + y / 7) % 5 != 0)
+                        in[y * w + x] = uint8_t((y / 9) % 2 ? p.flat : 0);  // bands reaching both edges
         }
         ReliefBlur(in.data(), out.data(), w, r, h);
         std::vector<int> wt(r + 1, 100);
