@@ -10,7 +10,7 @@
 //     weights rounded in single precision) over a rectangle of a byte plane,
 //     vertical pass into a row buffer, horizontal pass into the destination,
 //     both the shared row kernel of GxBlurRows; tiles of columns whose taps
-//     all read 0 get their zeros without it.
+//     all read one byte get it without the kernel.
 //     It writes only its rectangle; the rest of the destination keeps what it
 //     held, which the plane rotation below relies on.
 //   - ReliefDT1D / ReliefExactTransform: the lower-envelope squared Euclidean
