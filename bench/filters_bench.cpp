@@ -1,14 +1,23 @@
 // Effect filters on realistic text masks: a 96 px title line (about
 // 1200 x 200) and a six-line paragraph (about 1000 x 400). Each case reports
 // the time of one post-processing call and megapixels of canvas per second.
+//
+//   filters_bench [benchmark options]
+//   filters_bench --relief-hash   a hash of the bevel's and the emboss's output
+//                                 over a broad set of parameters, one case a
+//                                 line: to check that a change of the relief
+//                                 code leaves every byte as it was
 
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
+#include <cstdio>
+#include <cstring>
 #include <memory>
 #include <random>
+#include <vector>
 
 #include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
@@ -251,5 +260,136 @@ BENCHMARK_CAPTURE(BM_Emboss, smooth_10_soften_4, 0, 0, 10.0f, 4)->Arg(0)->Arg(1)
 BENCHMARK_CAPTURE(BM_Emboss, smooth_30_exact, 0, 0, 30.0f, 0)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(BM_Emboss, two_sided_smooth_10, 3, 0, 10.0f, 0)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 
+// ------------------------------------------------- relief output hashes
+
+uint64_t Fnv1a(uint64_t hash, const GxBitmap& image) {
+    const size_t bytes = size_t(image.width) * image.height * image.bytesPerPixel;
+    for (size_t k = 0; k < bytes; ++k) hash = (hash ^ image.pixels[k]) * 1099511628211ull;
+    return hash;
+}
+
+struct ReliefCase {
+    bool emboss;
+    int scene;  // 0 title, 1 paragraph, 2 a small mask with the text against its edges
+    int style, technique, soften, direction, separate;
+    float size, depth, angle, altitude;
+    uint32_t highlight, shadow;
+};
+
+// One render onto a destination of fixed random bytes (so the blend modes
+// show), the emboss also into an extra destination when it has a work image.
+uint64_t ReliefHash(const ReliefCase& c, const Scene& scene) {
+    GxBitmap dst(scene.dst.width, scene.dst.height, 4);
+    std::mt19937 rng(3);
+    for (size_t k = 0; k < size_t(dst.width) * dst.height * 4; ++k) dst.pixels[k] = uint8_t(rng() >> 24);
+    GxBitmap extra(dst);
+    GxBitmap mask(scene.mask);
+    GxRect box = scene.box;
+    GxECore::ParamPostProcessing pp{&dst, &mask, &box, c.separate, c.separate ? &extra : nullptr};
+    std::unique_ptr<GxECoreBase> layer;
+    if (c.emboss) {
+        auto emboss = std::make_unique<GxEmboss>();
+        GxEmbossProperty record(c.style, c.depth, c.size, c.direction, c.technique, c.soften, 1.0f, c.angle,
+                                c.altitude, c.highlight, 1.0f, c.shadow, 1.0f);
+        emboss->setProperty(&record);
+        layer = std::move(emboss);
+    } else {
+        auto bevel = std::make_unique<GxBevel>();
+        GxBevelProperty record(c.style, c.depth, c.size, c.direction, c.technique, c.soften, 1.0f, c.angle,
+                               c.altitude, c.highlight, 1.0f, c.shadow, 1.0f);
+        bevel->setProperty(&record);
+        layer = std::move(bevel);
+    }
+    layer->doPostProcessing(&pp);
+    uint64_t hash = Fnv1a(1469598103934665603ull, dst);
+    return c.separate ? Fnv1a(hash, extra) : hash;
+}
+
+int ReliefHashes() {
+    Scene scenes[3] = {MakeScene(0), MakeScene(1), {}};
+    scenes[2].mask = TextLikeMask(150, 60, 1, 0, 40.0f, &scenes[2].box);
+    scenes[2].dst = GxBitmap(150, 60, 4);
+
+    std::vector<ReliefCase> cases;
+    const ReliefCase base{false, 0, 1, 0, 0, 1, 0, 5.0f, 3.0f, 120.0f, 30.0f, 0xBFFFFFFFu, 0xBF000000u};
+    // Every size 0..30 with each technique (2 acts as hard), the bevel's inner
+    // and outer styles and the emboss's plain and two-sided ones, on all scenes.
+    for (int emboss = 0; emboss < 2; ++emboss)
+        for (int scene = 0; scene < 3; ++scene)
+            for (int style : {0, 1, 3})
+                for (int technique = 0; technique < 3; ++technique)
+                    for (int size = 0; size <= 30; ++size) {
+                        if (style == (emboss ? 1 : 3)) continue;
+                        if (technique == 2 && size % 5 != 0) continue;
+                        ReliefCase c = base;
+                        c.emboss = emboss;
+                        c.scene = scene;
+                        c.style = style;
+                        c.technique = technique;
+                        c.size = float(size);
+                        cases.push_back(c);
+                    }
+    // Soften over sizes and techniques.
+    for (int emboss = 0; emboss < 2; ++emboss)
+        for (int soften : {1, 2, 3, 5, 8, 16})
+            for (int technique = 0; technique < 2; ++technique)
+                for (float size : {2.0f, 7.0f, 12.0f, 17.0f, 28.0f}) {
+                    ReliefCase c = base;
+                    c.emboss = emboss;
+                    c.style = emboss ? 3 : (soften % 2);
+                    c.technique = technique;
+                    c.soften = soften;
+                    c.size = size;
+                    c.scene = soften % 3 == 0 ? 1 : 0;
+                    cases.push_back(c);
+                }
+    // The light and everything else at random, with a fixed seed.
+    std::mt19937 rng(20240611);
+    const float depths[] = {0.0f, 0.05f, 0.15f, 0.5f, 1.0f, 3.0f, 10.0f, 100.0f};
+    const float angles[] = {0.0f, 30.0f, 45.0f, 90.0f, 120.0f, 135.0f, 180.0f, 225.0f, 270.0f, 300.0f, 359.5f, -40.0f, 77.7f};
+    const float altitudes[] = {0.0f, 5.0f, 15.0f, 30.0f, 45.0f, 60.0f, 89.0f, 90.0f};
+    const float sizes[] = {-1.0f, 0.4f, 1.0f, 2.5f, 4.6f, 6.0f, 9.0f, 10.0f, 13.9f, 14.0f, 15.0f, 19.0f, 24.0f,
+                           25.5f, 26.0f, 29.0f, 33.0f, 40.0f, 60.0f};
+    for (int k = 0; k < 700; ++k) {
+        ReliefCase c;
+        c.emboss = rng() % 2;
+        c.scene = int(rng() % 3);
+        c.style = int(rng() % 4);
+        c.technique = int(rng() % 3);
+        c.soften = rng() % 3 == 0 ? int(rng() % 17) : 0;
+        c.direction = int(rng() % 2);
+        c.separate = int(rng() % 2);
+        c.size = sizes[rng() % std::size(sizes)];
+        c.depth = depths[rng() % std::size(depths)];
+        c.angle = angles[rng() % std::size(angles)];
+        c.altitude = altitudes[rng() % std::size(altitudes)];
+        c.highlight = rng() | (rng() % 4 == 0 ? 0xFF000000u : 0u);
+        c.shadow = rng() | (rng() % 4 == 0 ? 0xFF000000u : 0u);
+        cases.push_back(c);
+    }
+
+    uint64_t all = 1469598103934665603ull;
+    for (const ReliefCase& c : cases) {
+        const uint64_t hash = ReliefHash(c, scenes[c.scene]);
+        std::printf("%s scene %d style %d technique %d size %g soften %d depth %g direction %d angle %g "
+                    "altitude %g colours %08x %08x separate %d: %016llx\n",
+                    c.emboss ? "emboss" : "bevel", c.scene, c.style, c.technique, double(c.size), c.soften,
+                    double(c.depth), c.direction, double(c.angle), double(c.altitude), c.highlight, c.shadow,
+                    c.separate, (unsigned long long)hash);
+        all = (all ^ hash) * 1099511628211ull;
+    }
+    std::printf("%zu cases, all: %016llx\n", cases.size(), (unsigned long long)all);
+    return 0;
+}
+
 }  // namespace
 }  // namespace Glimmer
+
+int main(int argc, char** argv) {
+    if (argc == 2 && std::strcmp(argv[1], "--relief-hash") == 0) return Glimmer::ReliefHashes();
+    benchmark::Initialize(&argc, argv);
+    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
+    benchmark::RunSpecifiedBenchmarks();
+    benchmark::Shutdown();
+    return 0;
+}

@@ -49,8 +49,10 @@
 
 #include <cmath>
 #include <cstdlib>
+#include <cstring>
 
 #include "effect/GxEffectMath.h"
+#include "effect/filters/GxReliefRows.h"
 #include "effect/filters/GxSqrt.h"
 
 namespace Glimmer {
@@ -93,27 +95,26 @@ int GxBevel::partialDT(void* raw) {
     auto* job = static_cast<DistanceJob*>(raw);
     if (job == nullptr) return 0;
     return ReliefLocalDistance(job->field, job->width, job->height, job->radius, job->y0, job->y1,
-                               GxReliefTargets::kNonZero);
+                               GxReliefTargets::kNonZero, job->scratch);
 }
 
 int GxBevel::partialLightProcess(void* raw) {
     auto* job = static_cast<LightJob*>(raw);
-    if (job == nullptr || job->field == nullptr) return 0;
-    const GxReliefLight light{job->lightX, job->lightY, job->lightZ};
-    const float range = float(job->range);
+    if (job == nullptr || job->field == nullptr || job->x0 >= job->x1) return 0;
+    ReliefRows::Light light;
+    light.x = job->lightX;
+    light.y = job->lightY;
+    light.z = job->lightZ;
+    light.normalZ = job->normalZ;
+    light.range = float(job->range);
+    light.secondAlpha = job->secondAlpha;
+    light.firstAlpha = job->firstAlpha;
+    light.inside = job->inside;
+    const ReliefRows::BevelLightRow row = ReliefRows::Active().bevelLight;
     const ptrdiff_t stride = job->stride;
     for (int y = job->y0; y < job->y1; ++y) {
-        for (int x = job->x0; x < job->x1; ++x) {
-            const ptrdiff_t i = ptrdiff_t(y) * stride + x;
-            const float* d = job->field + i;
-            if (*d == range) continue;  // flat top or flat ground
-            const float level =
-                ReliefClampLevel(ReliefSlopeIncidence(light, job->normalZ, d, stride, 0.5f) * 255.0f);
-            const float v = job->inside ? level : float(255 - int(level));
-            const int edge = ReliefEdgeFactor(range - *d);
-            job->secondPlane[i] = ReliefPlaneValue(job->secondAlpha * int(v + 1.0f), edge);
-            job->firstPlane[i] = ReliefPlaneValue((256 - int(v)) * job->firstAlpha, edge);
-        }
+        const ptrdiff_t i = ptrdiff_t(y) * stride + job->x0;
+        row(job->field + i, stride, job->x1 - job->x0, light, job->secondPlane + i, job->firstPlane + i);
     }
     return 0;
 }
@@ -137,69 +138,81 @@ void GxBevel::doPostProcessing(GxECore::ParamPostProcessing* pp) {
     const int H = frame.height;
     const int M = frame.margin;
     const size_t stride = size_t(W);
+    const size_t N = frame.pixels;
 
-    float* field = static_cast<float*>(std::malloc(sizeof(float) * frame.pixels));
-    GxReliefPlanes planes;
-    if (field == nullptr || !planes.Allocate(frame.pixels)) {
-        std::free(field);
-        return;
-    }
+    // The field, later the frame's words; the two planes and the blurs' spare.
+    GxScratch* scratch = pp->scratch;
+    GxReliefBuffer fieldMemory(scratch, GxScratch::kPlaneA);
+    GxReliefBuffer planeMemory(scratch, GxScratch::kPlaneB);
+    GxReliefBuffer rowMemory(scratch, GxScratch::kRows);
+    const bool blurs = g.smooth || g.soften >= 1;
+    float* field = fieldMemory.get<float>(N);
+    unsigned char* planeBytes = planeMemory.get<unsigned char>(N * (blurs ? 3 : 2));
+    if (field == nullptr || planeBytes == nullptr) return;
 
     const bool inside = prop.style == 1;
     const GxBitmap& mask = *pp->src;
     if (g.exact) {
         const float glyphValue = inside ? kFar : 0.0f;
         const float otherValue = inside ? 0.0f : kFar;
+        // Glyph pixels: rows and columns M .. size - M, both ends included.
+        const int last = W - M < W - 1 ? W - M : W - 1;
+        unsigned char* bytes = rowMemory.get<unsigned char>(stride);
+        if (bytes == nullptr) return;
         for (int y = 0; y < H; ++y) {
             float* row = field + size_t(y) * stride;
-            const bool rowInWindow = y >= M && y <= H - M;
-            for (int x = 0; x < W; ++x) {
-                const bool glyph = rowInWindow && x >= M && x <= W - M &&
-                                   ReliefMaskAt(mask, int64_t(frame.x0) + x, int64_t(frame.y0) + y) != 0;
-                row[x] = glyph ? glyphValue : otherValue;
-            }
+            for (int x = 0; x < W; ++x) row[x] = otherValue;
+            if (y < M || y > H - M || last < M) continue;
+            ReliefMaskRow(mask, int64_t(frame.x0) + M, int64_t(frame.y0) + y, last - M + 1, bytes);
+            for (int x = M; x <= last; ++x)
+                if (bytes[x - M] != 0) row[x] = glyphValue;
         }
-        if (!ReliefExactTransform(field, W, H)) {
-            std::free(field);
-            return;
-        }
+        // Past the range every value becomes the range: the transform is
+        // needed exactly only up to range^2.
+        if (!ReliefExactTransformNear(field, W, H, g.range, scratch)) return;
         const float rangeSquared = float(int64_t(g.range) * g.range);
-        for (size_t i = 0; i < frame.pixels; ++i) {
+        for (size_t i = 0; i < N; ++i) {
             const float v = field[i];
             field[i] = v <= 0.0f ? 0.0f : (v > rangeSquared ? float(g.range) : fsqrt(v));
         }
     } else {
+        // The starting value of every coverage byte, as the per-pixel rule gives it.
+        float start[256];
+        for (int m = 0; m < 256; ++m) {
+            const float f = float(inside ? m ^ 255 : m) / kBevelVariant.coverageScale;
+            start[m] = f <= 0.001f ? float(g.range) : (f < 1.0f ? 1.0f - f : 0.0f);
+        }
         const float fill = inside ? 0.0f : float(g.range);
-        for (size_t i = 0; i < frame.pixels; ++i) field[i] = fill;
+        for (size_t i = 0; i < N; ++i) field[i] = fill;
         const int textWidth = text.right - text.left;
         const int textHeight = text.bottom - text.top;
+        unsigned char* bytes = rowMemory.get<unsigned char>(size_t(textWidth > 0 ? textWidth : 1));
+        if (bytes == nullptr) return;
         for (int j = 0; j < textHeight; ++j) {
             float* row = field + size_t(M + j) * stride + size_t(M);
-            for (int i = 0; i < textWidth; ++i) {
-                unsigned m = ReliefMaskAt(mask, int64_t(text.left) + i, int64_t(text.top) + j);
-                if (inside) m ^= 255;
-                const float f = float(m) / kBevelVariant.coverageScale;
-                row[i] = f <= 0.001f ? float(g.range) : (f < 1.0f ? 1.0f - f : 0.0f);
-            }
+            ReliefMaskRow(mask, text.left, int64_t(text.top) + j, textWidth, bytes);
+            for (int i = 0; i < textWidth; ++i) row[i] = start[bytes[i]];
         }
-        DistanceJob job{field, H, W, g.range, 0, H};
+        DistanceJob job{field, H, W, g.range, 0, H, scratch};
         partialDT(&job);
     }
 
+    // The lighting leaves the frame's outer ring and flat pixels as they are: zero.
+    std::memset(planeBytes, 0, 2 * N);
+    GxReliefPlanes planes;
+    planes.Use(planeBytes, planeBytes + N, blurs ? planeBytes + 2 * N : nullptr);
     LightJob lightJob{planes.second, planes.first, W, g.range, normalZ, light.x, light.y, light.z,
                       int(ReliefSecondColour(prop) >> 24), int(ReliefFirstColour(prop) >> 24), inside, field,
                       1, W - 1, 1, H - 1};
     partialLightProcess(&lightJob);
-    std::free(field);
 
-    if (!ReliefSmoothAndSoften(&planes, W, H, g.smooth, g.smoothRadius, g.soften)) return;
+    if (!ReliefSmoothAndSoften(&planes, W, H, g.smooth, g.smoothRadius, g.soften, scratch)) return;
 
-    auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
+    uint32_t* argb = fieldMemory.get<uint32_t>(N);  // the field's memory, no longer needed
     if (argb == nullptr) return;
-    ReliefColourise(planes.first, planes.second, frame.pixels, g.gain, ReliefFirstColour(prop),
-                    ReliefSecondColour(prop), argb);
+    ReliefColourise(planes.first, planes.second, N, g.gain, ReliefFirstColour(prop), ReliefSecondColour(prop),
+                    argb);
     ReliefDrawFrame(kBevelVariant, frame, argb, pp->separateWorkImage, pp->dst, pp->extraDst);
-    std::free(argb);
 }
 
 }  // namespace Glimmer

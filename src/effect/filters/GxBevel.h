@@ -33,6 +33,7 @@ public:
         int width;
         int radius;
         int y0, y1;
+        GxScratch* scratch = nullptr;  // tables from its kRows and kPlaneC slots
     };
 
     // Lighting of the region [x0, x1) x [y0, y1) (one pixel inside the frame).

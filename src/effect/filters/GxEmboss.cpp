@@ -44,8 +44,10 @@
 
 #include <cmath>
 #include <cstdlib>
+#include <cstring>
 
 #include "effect/GxEffectMath.h"
+#include "effect/filters/GxReliefRows.h"
 #include "effect/filters/GxSqrt.h"
 
 namespace Glimmer {
@@ -54,33 +56,6 @@ namespace {
 constexpr float kFar = 1e20f;
 constexpr int kExactFromSize = 26;
 constexpr int kTwoSidedStyle = 3;
-
-// ((difference + 1) * weight) >> 8, 255 when the product reaches 65536.
-inline int WeightedAlpha(int difference, int weight) {
-    const int product = (difference + 1) * weight;
-    return product >= 65536 ? 255 : product >> 8;
-}
-
-inline int Channel(uint32_t argb, int shift) { return int((argb >> shift) & 0xFF); }
-
-// The two-sided pixel: the normal relief (weight m) over the mirrored one.
-uint32_t TwoSidedPixel(GxReliefTone normal, GxReliefTone mirrored, int m, uint32_t firstColour,
-                       uint32_t secondColour) {
-    const int alpha1 = WeightedAlpha(normal.difference, m);
-    const int alpha2 = WeightedAlpha(mirrored.difference, 255 - m);
-    const uint32_t c1 = ReliefTint(normal.first ? firstColour : secondColour, alpha1);
-    const uint32_t c2 = ReliefTint(mirrored.first ? firstColour : secondColour, alpha2);
-    if (alpha1 == 0) return c2;
-    if (alpha1 == 255) return c1;
-    const int k = 255 - alpha1;
-    int alpha = alpha1 + ((k * (alpha2 + 1)) >> 8);
-    uint32_t out = uint32_t(alpha > 255 ? 255 : alpha) << 24;
-    for (int shift = 16; shift >= 0; shift -= 8) {
-        const int v = Channel(c1, shift) + ((k * (Channel(c2, shift) + 1)) >> 8);
-        out |= uint32_t(v > 255 ? 255 : v) << shift;
-    }
-    return out;
-}
 
 }  // namespace
 
@@ -125,102 +100,58 @@ int GxEmboss::partialOutDT(void* raw) {
     auto* job = static_cast<DistanceJob*>(raw);
     if (job == nullptr) return 0;
     return ReliefLocalDistance(job->field, job->width, job->height, job->outRadius, job->y0, job->y1,
-                               GxReliefTargets::kPositive);
+                               GxReliefTargets::kPositive, job->scratch);
 }
 
 // Inside pixels (below 0) take the largest v - sqrt(dx^2 + dy^2) over the
-// pixels above 1.0 within inRadius; rows outer, columns inner, each
-// improvement stored at once.
+// pixels above 1.0 within inRadius (GxReliefSearch.cpp).
 int GxEmboss::partialInDT(void* raw) {
     auto* job = static_cast<DistanceJob*>(raw);
-    if (job == nullptr || job->field == nullptr || job->width <= 0 || job->height <= 0) return 0;
-    const int width = job->width;
-    const int height = job->height;
-    const int largest = width > height ? width : height;
-    const int r = job->inRadius > largest ? largest : job->inRadius;
-    const int y0 = job->y0 > 0 ? job->y0 : 0;
-    const int y1 = job->y1 < height ? job->y1 : height;
-    if (r < 0) return 0;
-    GxReliefRoots roots(ReliefLargestRootIndex(width, height, r));
-    float* field = job->field;
-    const size_t stride = size_t(width);
-    for (int y = y0; y < y1; ++y) {
-        for (int x = 0; x < width; ++x) {
-            float cur = field[size_t(y) * stride + size_t(x)];
-            if (!(cur < 0.0f)) continue;
-            const int yyEnd = y + r + 1 < height ? y + r + 1 : height;
-            const int xxEnd = x + r + 1 < width ? x + r + 1 : width;
-            for (int yy = y - r > 0 ? y - r : 0; yy < yyEnd; ++yy) {
-                const float* row = field + size_t(yy) * stride;
-                const int64_t dy2 = int64_t(yy - y) * (yy - y);
-                for (int xx = x - r > 0 ? x - r : 0; xx < xxEnd; ++xx) {
-                    const float v = row[xx];
-                    if (!(v > 1.0f)) continue;
-                    const float candidate = v - roots[dy2 + int64_t(xx - x) * (xx - x)];
-                    if (cur < candidate) {
-                        cur = candidate;
-                        field[size_t(y) * stride + size_t(x)] = cur;
-                    }
-                }
-            }
-        }
-    }
+    if (job == nullptr) return 0;
+    ReliefInwardDistance(job->field, job->width, job->height, job->inRadius, job->y0, job->y1, job->scratch);
     return 0;
 }
 
+namespace {
+
+ReliefRows::Light RowLight(const GxEmboss::LightJob& job) {
+    ReliefRows::Light light;
+    light.x = job.lightX;
+    light.y = job.lightY;
+    light.z = job.lightZ;
+    light.normalZ = job.normalZ;
+    light.range = float(job.outRange);
+    light.inRange = float(job.inRange);
+    light.secondAlpha = job.secondAlpha;
+    light.firstAlpha = job.firstAlpha;
+    return light;
+}
+
+}  // namespace
+
 int GxEmboss::partialLightHardProcess(void* raw) {
     auto* job = static_cast<LightJob*>(raw);
-    if (job == nullptr || job->field == nullptr) return 0;
-    const GxReliefLight light{job->lightX, job->lightY, job->lightZ};
-    const float outRange = float(job->outRange);
-    const float inRange = float(job->inRange);
+    if (job == nullptr || job->field == nullptr || job->x0 >= job->x1) return 0;
+    const ReliefRows::Light light = RowLight(*job);
+    const ReliefRows::EmbossHardLightRow row = ReliefRows::Active().embossHardLight;
     const ptrdiff_t stride = job->stride;
     for (int y = job->y0; y < job->y1; ++y) {
-        for (int x = job->x0; x < job->x1; ++x) {
-            const ptrdiff_t i = ptrdiff_t(y) * stride + x;
-            const float* f = job->field + i;
-            if (*f == outRange) continue;
-            const float incidence = ReliefSlopeIncidence(light, job->normalZ, f, stride, 0.5f);
-            const int n = int(ReliefClampLevel(incidence * 255.0f));
-            // Outside the edge the height falls to Ro; inside, the flat floor 1 - Ri gives 0.
-            const float e = *f > 0.0f ? outRange - *f : *f + inRange - 1.0f;
-            const int edge = ReliefEdgeFactor(e);
-            job->secondPlane[i] = ReliefPlaneValue((256 - n) * job->secondAlpha, edge);
-            job->firstPlane[i] = ReliefPlaneValue((n + 1) * job->firstAlpha, edge);
-        }
+        const ptrdiff_t i = ptrdiff_t(y) * stride + job->x0;
+        row(job->field + i, stride, job->x1 - job->x0, light, job->secondPlane + i, job->firstPlane + i);
     }
     return 0;
 }
 
 int GxEmboss::partialLightSoftProcess(void* raw) {
     auto* job = static_cast<LightJob*>(raw);
-    if (job == nullptr || job->field == nullptr || job->innerField == nullptr) return 0;
-    const GxReliefLight light{job->lightX, job->lightY, job->lightZ};
-    const float outRange = float(job->outRange);
-    const float inRange = float(job->inRange);
+    if (job == nullptr || job->field == nullptr || job->innerField == nullptr || job->x0 >= job->x1) return 0;
+    const ReliefRows::Light light = RowLight(*job);
+    const ReliefRows::EmbossSoftLightRow row = ReliefRows::Active().embossSoftLight;
     const ptrdiff_t stride = job->stride;
     for (int y = job->y0; y < job->y1; ++y) {
-        for (int x = job->x0; x < job->x1; ++x) {
-            const ptrdiff_t i = ptrdiff_t(y) * stride + x;
-            const float* o = job->field + i;
-            if (*o > 0.0f && *o < outRange) {
-                const float incidence = ReliefSlopeIncidence(light, job->normalZ, o, stride, 0.5f);
-                const int n = int(ReliefClampLevel(incidence * 255.0f));
-                const int edge = ReliefEdgeFactor(outRange - *o);
-                job->secondPlane[i] = ReliefPlaneValue((256 - n) * job->secondAlpha, edge);
-                job->firstPlane[i] = ReliefPlaneValue((n + 1) * job->firstAlpha, edge);
-            }
-            const float* in = job->innerField + i;
-            if (*in > 0.0f && *in < inRange) {
-                // The inward distance is a descending height: gradient negated,
-                // level inverted, the washes' roles swapped.
-                const float incidence = ReliefSlopeIncidence(light, job->normalZ, in, stride, -0.5f);
-                const int n = int(ReliefClampLevel((1.0f - incidence) * 255.0f));
-                const int edge = ReliefEdgeFactor(inRange - *in);
-                job->secondPlane[i] = ReliefPlaneValue((n + 1) * job->secondAlpha, edge);
-                job->firstPlane[i] = ReliefPlaneValue((256 - n) * job->firstAlpha, edge);
-            }
-        }
+        const ptrdiff_t i = ptrdiff_t(y) * stride + job->x0;
+        row(job->field + i, job->innerField + i, stride, job->x1 - job->x0, light, job->secondPlane + i,
+            job->firstPlane + i);
     }
     return 0;
 }
@@ -244,12 +175,27 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
     const int H = frame.height;
     const int M = frame.margin;
     const size_t stride = size_t(W);
+    const size_t N = frame.pixels;
     const bool twoSided = prop.style == kTwoSidedStyle;
 
+    // The field or fields, later the frame's words; the plane pairs and the
+    // blurs' spare, which the pairs share as they take turns.
+    GxScratch* scratch = pp->scratch;
+    GxReliefBuffer fieldMemory(scratch, GxScratch::kPlaneA);
+    GxReliefBuffer planeMemory(scratch, GxScratch::kPlaneB);
+    GxReliefBuffer rowMemory(scratch, GxScratch::kRows);
+    const bool blurs = g.smooth || g.soften >= 1;
+    const size_t pairs = twoSided ? 2 : 1;
+    float* fields = fieldMemory.get<float>(g.exact ? 2 * N : N);
+    unsigned char* planeBytes = planeMemory.get<unsigned char>(N * (2 * pairs + (blurs ? 1 : 0)));
+    if (fields == nullptr || planeBytes == nullptr) return;
+    // The lighting leaves the frame's outer ring and unlit pixels as they are: zero.
+    std::memset(planeBytes, 0, 2 * pairs * N);
+    unsigned char* spare = blurs ? planeBytes + 2 * pairs * N : nullptr;
     GxReliefPlanes normal;
     GxReliefPlanes mirrored;
-    if (!normal.Allocate(frame.pixels)) return;
-    if (twoSided && !mirrored.Allocate(frame.pixels)) return;
+    normal.Use(planeBytes, planeBytes + N, spare);
+    if (twoSided) mirrored.Use(planeBytes + 2 * N, planeBytes + 3 * N, spare);
 
     const GxBitmap& mask = *pp->src;
     LightJob job{normal.second, normal.first, nullptr, nullptr, W, g.outRange, g.inRange, normalZ,
@@ -267,81 +213,98 @@ void GxEmboss::doPostProcessing(GxECore::ParamPostProcessing* pp) {
     };
 
     if (g.exact) {
-        float* outer = static_cast<float*>(std::malloc(sizeof(float) * frame.pixels));
-        float* inner = static_cast<float*>(std::malloc(sizeof(float) * frame.pixels));
-        bool ok = outer != nullptr && inner != nullptr;
-        if (ok) {
-            for (int y = 0; y < H; ++y) {
-                const bool rowInWindow = y >= M && y <= H - M;
-                for (int x = 0; x < W; ++x) {
-                    const bool glyph = rowInWindow && x >= M && x <= W - M &&
-                                       ReliefMaskAt(mask, int64_t(frame.x0) + x, int64_t(frame.y0) + y) != 0;
-                    outer[size_t(y) * stride + size_t(x)] = glyph ? 0.0f : kFar;
-                    inner[size_t(y) * stride + size_t(x)] = glyph ? kFar : 0.0f;
-                }
+        float* outer = fields;
+        float* inner = fields + N;
+        // Glyph pixels: rows and columns M .. size - M, both ends included.
+        const int last = W - M < W - 1 ? W - M : W - 1;
+        unsigned char* bytes = rowMemory.get<unsigned char>(stride);
+        if (bytes == nullptr) return;
+        for (int y = 0; y < H; ++y) {
+            float* o = outer + size_t(y) * stride;
+            float* in = inner + size_t(y) * stride;
+            for (int x = 0; x < W; ++x) {
+                o[x] = kFar;
+                in[x] = 0.0f;
             }
-            ok = ReliefExactTransform(outer, W, H) && ReliefExactTransform(inner, W, H);
-        }
-        if (ok) {
-            for (size_t i = 0; i < frame.pixels; ++i) {
-                outer[i] = outer[i] >= 0.0f ? fsqrt(outer[i]) : 0.0f;
-                inner[i] = inner[i] >= 0.0f ? fsqrt(inner[i]) : 0.0f;
+            if (y < M || y > H - M || last < M) continue;
+            ReliefMaskRow(mask, int64_t(frame.x0) + M, int64_t(frame.y0) + y, last - M + 1, bytes);
+            for (int x = M; x <= last; ++x) {
+                if (bytes[x - M] == 0) continue;
+                o[x] = 0.0f;
+                in[x] = kFar;
             }
-            job.field = outer;
-            job.innerField = inner;
-            lightBoth(&partialLightSoftProcess);
         }
-        std::free(outer);
-        std::free(inner);
-        if (!ok) return;
+        // The soft lighting reads a distance where it lies strictly between 0
+        // and its range, and at the four neighbours of such a pixel. fsqrt is
+        // within 0.2 % of the root, so a squared distance past (range + 2)^2
+        // never passes for one below the range, and those neighbours lie
+        // within range + 2: the transforms are needed exactly only that far.
+        if (!ReliefExactTransformNear(outer, W, H, g.outRange + 2, scratch) ||
+            !ReliefExactTransformNear(inner, W, H, g.inRange + 2, scratch)) {
+            return;
+        }
+        for (size_t i = 0; i < N; ++i) {
+            outer[i] = outer[i] >= 0.0f ? fsqrt(outer[i]) : 0.0f;
+            inner[i] = inner[i] >= 0.0f ? fsqrt(inner[i]) : 0.0f;
+        }
+        job.field = outer;
+        job.innerField = inner;
+        lightBoth(&partialLightSoftProcess);
     } else {
-        float* field = static_cast<float*>(std::malloc(sizeof(float) * frame.pixels));
-        if (field == nullptr) return;
+        float* field = fields;
         const float outside = float(g.outRange);
-        for (size_t i = 0; i < frame.pixels; ++i) field[i] = outside;
         const float floor = float(1 - g.inRange);
+        // The starting value of every coverage byte, as the per-pixel rule gives it.
+        float start[256];
+        for (int m = 0; m < 256; ++m) {
+            const float f = float(m) / kEmbossVariant.coverageScale;
+            start[m] = f < 0.001f ? outside : (f < 1.0f ? 1.0f - f : floor);
+        }
+        for (size_t i = 0; i < N; ++i) field[i] = outside;
         const int textWidth = text.right - text.left;
         const int textHeight = text.bottom - text.top;
+        unsigned char* bytes = rowMemory.get<unsigned char>(size_t(textWidth > 0 ? textWidth : 1));
+        if (bytes == nullptr) return;
         for (int j = 0; j < textHeight; ++j) {
             float* row = field + size_t(M + j) * stride + size_t(M);
-            for (int i = 0; i < textWidth; ++i) {
-                const unsigned m = ReliefMaskAt(mask, int64_t(text.left) + i, int64_t(text.top) + j);
-                const float f = float(m) / kEmbossVariant.coverageScale;
-                row[i] = f < 0.001f ? outside : (f < 1.0f ? 1.0f - f : floor);
-            }
+            ReliefMaskRow(mask, text.left, int64_t(text.top) + j, textWidth, bytes);
+            for (int i = 0; i < textWidth; ++i) row[i] = start[bytes[i]];
         }
-        DistanceJob distance{field, H, W, g.outRange, g.inRange, 1, H};
+        DistanceJob distance{field, H, W, g.outRange, g.inRange, 1, H, scratch};
         partialOutDT(&distance);
         partialInDT(&distance);
         job.field = field;
         lightBoth(&partialLightHardProcess);
-        std::free(field);
     }
 
-    if (twoSided && !ReliefSmoothAndSoften(&mirrored, W, H, g.smooth, g.smoothRadius, g.soften)) return;
-    if (!ReliefSmoothAndSoften(&normal, W, H, g.smooth, g.smoothRadius, g.soften)) return;
+    if (twoSided) {
+        if (!ReliefSmoothAndSoften(&mirrored, W, H, g.smooth, g.smoothRadius, g.soften, scratch)) return;
+        normal.spare = mirrored.spare;  // the buffer the mirrored pair left free
+    }
+    if (!ReliefSmoothAndSoften(&normal, W, H, g.smooth, g.smoothRadius, g.soften, scratch)) return;
 
-    auto* argb = static_cast<uint32_t*>(std::malloc(sizeof(uint32_t) * frame.pixels));
+    uint32_t* argb = fieldMemory.get<uint32_t>(N);  // the fields' memory, no longer needed
     if (argb == nullptr) return;
     if (!twoSided) {
-        ReliefColourise(normal.first, normal.second, frame.pixels, g.gain, ReliefFirstColour(prop),
-                        ReliefSecondColour(prop), argb);
+        ReliefColourise(normal.first, normal.second, N, g.gain, ReliefFirstColour(prop), ReliefSecondColour(prop),
+                        argb);
     } else {
+        // The coverage weighs the normal relief strictly inside the text
+        // rectangle's first row and column: columns M + 1 .. W - M - 1.
+        unsigned char* coverage = rowMemory.get<unsigned char>(stride);
+        if (coverage == nullptr) return;
+        const int width = W - 2 * M - 1;
+        const ReliefRows::TwoSidedRow twoSidedRow = ReliefRows::Active().twoSided;
         for (int y = 0; y < H; ++y) {
-            const bool rowInside = y > M && y < H - M;
-            for (int x = 0; x < W; ++x) {
-                const size_t i = size_t(y) * stride + size_t(x);
-                const int m = rowInside && x > M && x < W - M
-                                  ? int(ReliefMaskAt(mask, int64_t(frame.x0) + x, int64_t(frame.y0) + y))
-                                  : 0;
-                argb[i] = TwoSidedPixel(ReliefTone(normal.first[i], normal.second[i], g.gain),
-                                        ReliefTone(mirrored.first[i], mirrored.second[i], g.gain), m,
-                                        ReliefFirstColour(prop), ReliefSecondColour(prop));
-            }
+            std::memset(coverage, 0, stride);
+            if (y > M && y < H - M && width > 0)
+                ReliefMaskRow(mask, int64_t(frame.x0) + M + 1, int64_t(frame.y0) + y, width, coverage + M + 1);
+            const size_t i = size_t(y) * stride;
+            twoSidedRow(normal.first + i, normal.second + i, mirrored.first + i, mirrored.second + i, coverage, W,
+                        g.gain, ReliefFirstColour(prop), ReliefSecondColour(prop), argb + i);
         }
     }
     ReliefDrawFrame(kEmbossVariant, frame, argb, pp->separateWorkImage, pp->dst, pp->extraDst);
-    std::free(argb);
 }
 
 }  // namespace Glimmer

@@ -36,6 +36,7 @@ public:
         int outRadius;
         int inRadius;
         int y0, y1;
+        GxScratch* scratch = nullptr;  // planes and tables from its kPlaneC and kRows slots
     };
 
     // Lighting of the region [x0, x1) x [y0, y1) (one pixel inside the frame).

@@ -9,27 +9,36 @@
 //   - ReliefPartialBlur: the separable integer Gaussian (centre weight 100,
 //     weights rounded in single precision) over a rectangle of a byte plane,
 //     vertical pass into a row buffer, horizontal pass into the destination,
-//     both the shared row kernel of GxBlurRows.
+//     both the shared row kernel of GxBlurRows; tiles of columns whose taps
+//     all read one byte get it without the kernel.
 //     It writes only its rectangle; the rest of the destination keeps what it
 //     held, which the plane rotation below relies on.
 //   - ReliefDT1D / ReliefExactTransform: the lower-envelope squared Euclidean
 //     distance transform of a line, and of a whole field (columns first, then
-//     rows), in single precision with integer squares.
-//   - ReliefLocalDistance: the local search used for smaller reliefs. Every
-//     "target" pixel takes the smallest v + sqrt(dx^2 + dy^2) over the
-//     "source" pixels (value below 1.0) in its square window, the root read
-//     from the rounded square-root table. Because every improvement is at least
-//     1.0 it never creates a new source, so the sources can be indexed first
-//     and searched nearest-first; the literal scan is kept beside it as
-//     ReliefLocalDistanceReference and the two agree bit for bit.
+//     rows), in single precision with integer squares. The line-by-line
+//     literal form is kept as ReliefExactTransformReference; the transform in
+//     use leaves out the steps that provably change no bit on the fields of 0
+//     and far the layers build.
+//   - ReliefLocalDistance / ReliefInwardDistance: the local searches used for
+//     smaller reliefs (GxReliefSearch.cpp): every target pixel takes the best
+//     candidate, a value plus or minus sqrt(dx^2 + dy^2) from the rounded
+//     square-root table, over the source pixels of its square window. Their
+//     literal scans are kept beside them as the references; they agree bit
+//     for bit.
 //   - the light vector, the slope's lighting level, the edge factor that fades
 //     a wash out where the field reaches its range, the plane write
 //     ((amount >> 8) + 1) * edge >> 8, and the premultiplied colouring that
-//     keeps whichever wash is stronger.
+//     keeps whichever wash is stronger; by the row, with vector kernels, in
+//     GxReliefRows.
 //   - ReliefSmoothAndSoften: the blur passes over both planes with their buffer
 //     rotation. Each blur writes only its inner region, and the buffers are
 //     reused in a fixed order, so the outer strips of a plane may keep values
 //     of the other plane; that is the layers' established output and is kept.
+//
+// A render takes its memory from the stack's scratch when it has one (the
+// field and then the frame's words in kPlaneA, the planes and the blurs'
+// spare in kPlaneB, search planes in kPlaneC, rows and tables in kRows), so
+// renders of a size drawn before allocate nothing.
 //
 // The deliberate differences between the layers stay explicit: the coverage
 // divisor (254.99 bevel, 254.999 emboss), the depth floor of the normal (0.1,
@@ -39,6 +48,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstdlib>
 #include <new>
 
 #include "effect/GxECoreBase.h"
@@ -105,6 +115,35 @@ inline unsigned ReliefMaskAt(const GxBitmap& mask, int64_t x, int64_t y) {
     return mask.pixels[index];
 }
 
+// The mask bytes at (x, y) .. (x + count - 1, y) as ReliefMaskAt reads them,
+// into out.
+void ReliefMaskRow(const GxBitmap& mask, int64_t x, int64_t y, int count, unsigned char* out);
+
+// Memory for one render: a slot of the stack's scratch when there is one
+// (nothing allocated once the slot has grown), else the heap, freed with the
+// buffer. Each get() may replace what an earlier one returned.
+class GxReliefBuffer {
+public:
+    GxReliefBuffer(GxScratch* scratch, GxScratch::Slot slot) : scratch_(scratch), slot_(slot) {}
+    ~GxReliefBuffer() { std::free(owned_); }
+    GxReliefBuffer(const GxReliefBuffer&) = delete;
+    GxReliefBuffer& operator=(const GxReliefBuffer&) = delete;
+
+    // count T, or null when they cannot be had.
+    template <typename T>
+    T* get(size_t count) {
+        if (count > (SIZE_MAX - 64) / sizeof(T)) return nullptr;
+        return static_cast<T*>(bytes(count * sizeof(T)));
+    }
+
+private:
+    void* bytes(size_t n);
+    GxScratch* scratch_;
+    GxScratch::Slot slot_;
+    void* owned_ = nullptr;
+    size_t ownedBytes_ = 0;
+};
+
 // ---- blur
 
 // Blur job: a rectangle [x0, x1) x [y0, y1) of byte planes `stride` bytes
@@ -134,8 +173,14 @@ void ReliefDT1D(const float* f, float* d, int n);
 // The same with caller scratch: v holds n ints, z n + 1 floats.
 void ReliefDT1D(const float* f, float* d, int n, int* v, float* z);
 // The transform down every column, then along every row, in place. false
-// (field untouched or half done) when scratch could not be had.
-bool ReliefExactTransform(float* field, int width, int height);
+// (field untouched or half done) when scratch could not be had. With
+// `scratch` its buffers come from the kRows slot.
+bool ReliefExactTransform(float* field, int width, int height, GxScratch* scratch = nullptr);
+// The same, line by line through ReliefDT1D: what the above must give.
+bool ReliefExactTransformReference(float* field, int width, int height);
+// The transform wherever it is at most reach^2, bit for bit; elsewhere some
+// value above reach^2. For the layers, which need no more.
+bool ReliefExactTransformNear(float* field, int width, int height, int reach, GxScratch* scratch = nullptr);
 
 // What counts as a pixel to improve in the local search.
 enum class GxReliefTargets {
@@ -143,15 +188,25 @@ enum class GxReliefTargets {
     kPositive,  // emboss outward pass: values above 0; candidate max(v, 0) + root
 };
 
-// Rows [y0, y1) of a width x height field, window radius `radius`.
-// Returns 0 (every outcome).
+// The local search over rows [y0, y1) of a width x height field, window
+// radius `radius` (GxReliefSearch.cpp tells how). With `scratch` its tables
+// come from the kRows and kPlaneC slots. Returns 0 (every outcome).
 int ReliefLocalDistance(float* field, int width, int height, int radius, int y0, int y1,
-                        GxReliefTargets targets);
+                        GxReliefTargets targets, GxScratch* scratch = nullptr);
 // The literal scan, rows outer and columns inner in increasing order, each
-// improvement stored at once. The fast search above falls back to it when
-// its scratch cannot be had (or, for kNonZero, when a source is negative).
+// improvement stored at once: what the search above must give. It also
+// serves it where its shortcuts do not hold (a negative source for kNonZero).
 void ReliefLocalDistanceReference(float* field, int width, int height, int radius, int y0, int y1,
                                   GxReliefTargets targets);
+
+// The emboss's inward pass over rows [y0, y1): every pixel below 0 takes the
+// largest v - sqrt(dx^2 + dy^2) over the pixels above 1.0 in its window of
+// `radius` (radius clamped to the larger side; negative: nothing). With
+// `scratch` its planes and tables come from the kPlaneC and kRows slots.
+void ReliefInwardDistance(float* field, int width, int height, int radius, int y0, int y1,
+                          GxScratch* scratch = nullptr);
+// Its literal scan, rows outer and columns inner, each improvement stored at once.
+void ReliefInwardDistanceReference(float* field, int width, int height, int radius, int y0, int y1);
 
 // sqrt(i) as the rounded table holds it, for every index a window can reach
 // (beyond the stored table too). Falls back to IntSqrt when a longer table
@@ -263,34 +318,49 @@ void ReliefColourise(const unsigned char* first, const unsigned char* second, si
 
 // ---- planes
 
-// The two wash planes of one lighting, frame-sized, owned (freed on
-// destruction). Which buffer holds which wash changes as the blurs rotate them.
+// The two wash planes of one lighting and the blurs' spare buffer, frame-
+// sized. Which buffer holds which wash changes as the blurs rotate them.
 struct GxReliefPlanes {
     GxReliefPlanes() = default;
     ~GxReliefPlanes();
     GxReliefPlanes(const GxReliefPlanes&) = delete;
     GxReliefPlanes& operator=(const GxReliefPlanes&) = delete;
 
-    // Both planes zeroed; false when either could not be had.
+    // Both planes zeroed, owned (freed on destruction); false when either
+    // could not be had.
     bool Allocate(size_t pixels);
+    // The caller's buffers, contents as they are; `spare` may be null.
+    void Use(unsigned char* secondPlane, unsigned char* firstPlane, unsigned char* sparePlane);
+    // A block freed on destruction (at most three), or null.
+    unsigned char* Own(size_t pixels, bool zeroed);
 
     unsigned char* second = nullptr;
     unsigned char* first = nullptr;
+    // What the blurs write into besides the planes; taken from the heap when
+    // null. Holds no wash the caller needs.
+    unsigned char* spare = nullptr;
+
+private:
+    unsigned char* owned_[3] = {};
 };
 
 // Smoothing (when `smooth`: the smooth technique, whatever its radius; a
 // radius of 0 copies), then softening (soften >= 1), of both planes
 // of a width x height frame:
 //   smoothing: a fresh zeroed plane P; blur second -> P, first -> second's
-//     buffer; then second = P, first = old second buffer, scratch = old first
+//     buffer; then second = P, first = old second buffer, spare = old first
 //     buffer (still holding the unblurred first wash).
-//   softening: scratch (or, without smoothing, a fresh zeroed plane); blur
-//     second -> scratch, first -> second's buffer; then second = scratch,
-//     first = second's buffer; the remaining buffer is freed.
+//   softening: the spare after smoothing (as it is), else a fresh zeroed
+//     plane S; blur second -> S, first -> second's buffer; then second = S,
+//     first = second's buffer, spare = the remaining buffer.
+// A blur writes only its inner region, so the outer strips show which buffer
+// went where; that is the layers' established output. A "fresh zeroed" plane
+// is the spare with the strips the blur leaves alone zeroed. With `scratch`
+// the blurs' row buffer comes from its kRows slot.
 // false when a plane or a blur's scratch could not be had, or the smoothing
 // radius is negative (planes then hold an unspecified but valid state).
 bool ReliefSmoothAndSoften(GxReliefPlanes* planes, int width, int height, bool smooth,
-                           int smoothRadius, int soften);
+                           int smoothRadius, int soften, GxScratch* scratch = nullptr);
 
 // ---- drawing
 

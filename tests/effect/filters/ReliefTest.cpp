@@ -1,10 +1,12 @@
 // The pieces bevel and emboss share (blur, distance transforms, the local
-// search against its literal scan, light, edge factor, plane writes,
-// colouring, plane rotation), then properties both layers must have.
+// searches against their literal scans, the row kernels against theirs,
+// light, edge factor, plane writes, colouring, plane rotation), then
+// properties both layers must have.
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstring>
 #include <random>
@@ -13,6 +15,7 @@
 #include "effect/filters/GxBevel.h"
 #include "effect/filters/GxEmboss.h"
 #include "effect/filters/GxRelief.h"
+#include "effect/filters/GxReliefRows.h"
 #include "effect/filters/GxSqrt.h"
 #include "effect/filters/LayerHarness.h"
 
@@ -34,10 +37,20 @@ TEST(ReliefKernels, BlurByHandAndAgainstTheFormula) {
     EXPECT_EQ(dst, want);
 
     std::mt19937 rng(7);
-    for (int r : {2, 5, 16}) {
-        const int w = 2 * r + 9, h = 2 * r + 6;
+    // Dense planes, and wide ones of flat patches (tiles of columns that read
+    // one byte throughout are passed over): zeros, and other constants.
+    struct Plane { int r, w, h, flat; };
+    for (Plane p : {Plane{2, 13, 10, -1}, Plane{5, 19, 16, -1}, Plane{16, 41, 38, -1}, Plane{3, 150, 12, 0},
+                    Plane{9, 230, 40, 0}, Plane{0, 99, 9, 77}, Plane{1, 180, 30, 77}, Plane{7, 300, 45, 200}}) {
+        const int r = p.r, w = p.w, h = p.h;
         std::vector<uint8_t> in(size_t(w) * h), out(in.size(), 0), ref(in.size(), 0);
         for (auto& v : in) v = uint8_t(rng() % 4 == 0 ? 255 : rng() % 256);
+        if (p.flat >= 0) {
+            for (int y = 0; y < h; ++y)
+                for (int x = 0; x < w; ++x)
+                    if (!(x > w / 3 && x < w / 2 && y % 5 < 2) && (x / 23 + y / 7) % 5 != 0)
+                        in[y * w + x] = uint8_t((y / 9) % 2 ? p.flat : 0);  // bands reaching both edges
+        }
         ReliefBlur(in.data(), out.data(), w, r, h);
         std::vector<int> wt(r + 1, 100);
         int total = 100;
@@ -77,6 +90,32 @@ TEST(ReliefKernels, DistanceTransformsAgainstBruteForce) {
             }
         }
     }
+    // The fast transform beside the literal one on fields of 0 and kFar as the
+    // layers build them: sparse seeds, glyph-like blocks, empty and full lines.
+    for (int trial = 0; trial < 24; ++trial) {
+        const int w = 1 + int(rng() % 70), h = 1 + int(rng() % 50);
+        const unsigned density = 1 + rng() % 6;
+        std::vector<float> fast(size_t(w) * h);
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x) {
+                bool zero = trial % 3 == 0 ? rng() % (3 * density) == 0 : ((x / 7 + y / 5) % density == 0);
+                if (trial % 4 == 1 && (x % 11 == 3 || y % 9 == 2)) zero = trial % 8 == 1;  // whole lines alike
+                fast[size_t(y) * w + x] = (zero != (trial % 2 == 0)) ? 0.0f : kFar;
+            }
+        std::vector<float> slow = fast, near = fast;
+        const int reach = int(rng() % 12);
+        ASSERT_TRUE(ReliefExactTransform(fast.data(), w, h));
+        ASSERT_TRUE(ReliefExactTransformNear(near.data(), w, h, reach));
+        ASSERT_TRUE(ReliefExactTransformReference(slow.data(), w, h));
+        ASSERT_EQ(std::memcmp(fast.data(), slow.data(), fast.size() * sizeof(float)), 0) << w << "x" << h;
+        const float most = float(reach * reach);
+        for (size_t i = 0; i < slow.size(); ++i)
+            ASSERT_TRUE(slow[i] <= most ? near[i] == slow[i] : near[i] > most) << w << "x" << h << " at " << i;
+    }
+    // What the emboss relies on to transform only that far: fsqrt stays within
+    // 0.2 % of the root of every squared distance a frame can hold.
+    for (int v = 1; v < (1 << 23); v += 1 + v / 4096)
+        ASSERT_TRUE(std::fabs(fsqrt(float(v)) - std::sqrt(float(v))) < 0.002f * std::sqrt(float(v))) << v;
     const int w = 17, h = 11;
     std::vector<float> field(w * h);
     for (float& v : field) v = rng() % 9 == 0 ? 0.0f : kFar;
@@ -93,33 +132,49 @@ TEST(ReliefKernels, DistanceTransformsAgainstBruteForce) {
     }
 }
 
-TEST(ReliefKernels, LocalSearchAgreesBitForBitWithTheLiteralScan) {
+TEST(ReliefKernels, SearchesAgreeBitForBitWithTheLiteralScans) {
     std::mt19937 rng(5);
-    // Fields shaped like the filters': a flat range, edge fractions, zeros,
-    // and (for the outward pass, and once to force the fallback) negatives.
-    auto randomField = [&](int w, int h, float range, bool negatives) {
+    // Fields shaped like the filters': a flat range, edge fractions, zeros, and
+    // by kind of trial: values past the range (which the disc cannot serve),
+    // negatives (the outward pass's inside, and the kNonZero fallback), and for
+    // the inward pass sources high enough to make new ones.
+    enum Trial { kPlain, kWide, kNegative, kHigh };
+    auto randomField = [&](int w, int h, float range, Trial trial) {
         std::vector<float> f(size_t(w) * h);
         for (float& v : f) {
             const unsigned r = rng() % 10;
-            v = r < 6 ? range : r < 8 ? 1.0f - float(1 + rng() % 254) / 254.99f
-                : (r < 9 || !negatives) ? 0.0f : -float(rng() % 4);
+            v = r < 6 ? range : r < 8 ? 1.0f - float(1 + rng() % 254) / 254.99f : r < 9 ? 0.0f : -float(rng() % 4);
+            if (trial == kWide && rng() % 5 == 0) v = range + 0.5f + float(rng() % 4);
+            if (trial == kPlain && v < 0.0f) v = 0.0f;
+            if (v == range && trial != kHigh) v = 1.0f + float(rng() % 1000) / 1000.0f;  // inward sources at most 2
         }
         return f;
     };
     struct Case { int w, h, radius, y0, y1; };
     for (Case c : {Case{9, 7, 3, 0, 7}, Case{20, 13, 5, 4, 9}, Case{31, 5, 12, 1, 5}, Case{6, 6, 40, 0, 6},
-                   Case{16, 16, 0, 0, 16}, Case{40, 30, 9, 10, 11}}) {
-        for (GxReliefTargets t : {GxReliefTargets::kNonZero, GxReliefTargets::kPositive}) {
-            for (int trial = 0; trial < 4; ++trial) {
-                std::vector<float> fast = randomField(c.w, c.h, float(c.radius), t == GxReliefTargets::kPositive || trial == 3);
-                std::vector<float> slow = fast;
+                   Case{16, 16, 0, 0, 16}, Case{40, 30, 9, 10, 11}, Case{84, 30, 78, 0, 30},  // disc past the table
+                   Case{140, 8, 130, 0, 8}}) {                                                 // nearest-first
+        for (Trial trial : {kPlain, kWide, kNegative, kHigh}) {
+            const std::vector<float> field = randomField(c.w, c.h, float(c.radius), trial);
+            for (GxReliefTargets t : {GxReliefTargets::kNonZero, GxReliefTargets::kPositive}) {
+                std::vector<float> fast = field, slow = field;
                 ReliefLocalDistance(fast.data(), c.w, c.h, c.radius, c.y0, c.y1, t);
                 ReliefLocalDistanceReference(slow.data(), c.w, c.h, c.radius, c.y0, c.y1, t);
                 ASSERT_EQ(std::memcmp(fast.data(), slow.data(), fast.size() * sizeof(float)), 0)
-                    << c.w << "x" << c.h << " r" << c.radius;
+                    << c.w << "x" << c.h << " r" << c.radius << " trial " << trial;
             }
+            std::vector<float> fast = field, slow = field;
+            ReliefInwardDistance(fast.data(), c.w, c.h, c.radius, c.y0, c.y1);
+            ReliefInwardDistanceReference(slow.data(), c.w, c.h, c.radius, c.y0, c.y1);
+            ASSERT_EQ(std::memcmp(fast.data(), slow.data(), fast.size() * sizeof(float)), 0)
+                << "inward " << c.w << "x" << c.h << " r" << c.radius << " trial " << trial;
         }
     }
+    // An inward improvement above 1.0 is a source for the pixels after it:
+    // the 8 is out of the last pixel's window, the new 7 is not.
+    std::vector<float> line = {8.0f, -5.0f, -5.0f};
+    ReliefInwardDistance(line.data(), 3, 1, 1, 0, 1);
+    EXPECT_EQ(line, (std::vector<float>{8.0f, 7.0f, 6.0f}));
     // One source in a 60 x 60 corner: the far corner is at index 6962, past
     // the root table's 5490 entries, and gets sqrt(6962) to three places.
     std::vector<float> fast(3600, 100.0f);
@@ -131,6 +186,149 @@ TEST(ReliefKernels, LocalSearchAgreesBitForBitWithTheLiteralScan) {
     EXPECT_EQ(fast[3599], 83.439f);
     GxReliefRoots roots(2 * 130 * 130);
     for (int i = 0; i < 2 * 130 * 130; i += 13) ASSERT_EQ(roots[i], IntSqrt(i)) << i;
+}
+
+// Every compiled row kernel beside its reference: random rows of every width
+// from 1 to 64 and some long ones, outputs poisoned with random bytes first.
+TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
+    std::mt19937 rng(13);
+    const auto variants = ReliefRows::Variants();
+    ASSERT_FALSE(variants.empty());
+    const ReliefRows::Table& reference = ReliefRows::ReferenceTable();
+    std::vector<int> widths;
+    for (int n = 1; n <= 64; ++n) widths.push_back(n);
+    widths.insert(widths.end(), {200, 1031});
+    auto bytes = [&](size_t n) {
+        std::vector<uint8_t> v(n);
+        for (auto& b : v) b = uint8_t(rng());
+        return v;
+    };
+    // Heights as the layers make them: the range itself (flat), steps of
+    // roots and fractions, zeros, negatives, and the odd value far off.
+    auto heights = [&](size_t n, float range) {
+        std::vector<float> v(n);
+        for (float& f : v) {
+            const unsigned k = rng() % 8;
+            f = k < 2 ? range : k < 3 ? 0.0f : k < 6 ? float(int(rng() % 2000) - 600) / 97.0f
+                : k < 7 ? IntSqrt(int(rng() % 300)) : (rng() % 2 ? 1e20f : -3.5f);
+        }
+        return v;
+    };
+    auto same = [](const auto& a, const auto& b) {
+        return a.size() == b.size() && std::memcmp(a.data(), b.data(), a.size() * sizeof(a[0])) == 0;
+    };
+
+    for (int n : widths) {
+        const size_t stride = size_t(n) + 2;
+        ReliefRows::Light light;
+        const GxReliefLight l = ReliefLightVector(float(rng() % 720) - 180.0f, float(rng() % 90), int(rng() % 2));
+        light.x = l.x, light.y = l.y, light.z = l.z;
+        light.normalZ = ReliefNormalZ(float(rng() % 300) / 20.0f, 0.1f);
+        light.range = float(1 + rng() % 12);
+        light.inRange = float(1 + rng() % 12);
+        light.secondAlpha = int(rng() % 256);
+        light.firstAlpha = int(rng() % 256);
+        light.inside = rng() % 2;
+        const std::vector<float> outer = heights(3 * stride, light.range);
+        const std::vector<float> inner = heights(3 * stride, light.inRange);
+        const float* o = outer.data() + stride + 1;
+        const float* in = inner.data() + stride + 1;
+        const std::vector<uint8_t> second = bytes(size_t(n)), first = bytes(size_t(n));
+
+        std::vector<uint8_t> want[3][2];
+        for (int k = 0; k < 3; ++k) want[k][0] = second, want[k][1] = first;
+        reference.bevelLight(o, ptrdiff_t(stride), n, light, want[0][0].data(), want[0][1].data());
+        reference.embossHardLight(o, ptrdiff_t(stride), n, light, want[1][0].data(), want[1][1].data());
+        reference.embossSoftLight(o, in, ptrdiff_t(stride), n, light, want[2][0].data(), want[2][1].data());
+
+        // A disc of radius r swept from a source near the row's middle or ends.
+        const int r = 1 + int(rng() % 9);
+        std::vector<int> chords(size_t(r) + 1);
+        std::vector<std::vector<float>> discRows(size_t(r) + 1);
+        std::vector<const float*> discRoots(size_t(r) + 1);
+        for (int a = 0; a <= r; ++a) {
+            chords[a] = int(std::sqrt(float(r * r - a * a)));
+            for (int dx = -chords[a]; dx <= chords[a]; ++dx) discRows[a].push_back(IntSqrt(a * a + dx * dx));
+            discRoots[a] = discRows[a].data() + chords[a];
+        }
+        const ReliefRows::Disc disc{chords.data(), discRoots.data()};
+        const int rows = 2 * r + 1;
+        const std::vector<float> swept = heights(size_t(n) * rows, float(r));
+        const int sourceX = int(rng() % 3) == 0 ? 0 : int(rng() % n);
+        const int left = int(rng() % (r + 2)), right = rng() % 4 == 0 ? 0 : r;
+        const float amount = float(rng() % 100) / 101.0f;
+        std::vector<float> wantSwept = swept;
+        reference.sweepSource(wantSwept.data(), n, n, sourceX, r, 0, rows, left, right, disc, amount);
+
+        const std::vector<float> sideRows = heights(3 * size_t(n), 1.5f);
+        const bool positive = rng() % 2;
+        std::vector<uint8_t> wantSides = bytes(size_t(n));
+        const std::vector<uint8_t> sidesPoison = wantSides;
+        reference.sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive,
+                             wantSides.data());
+
+        // A row of squared column distances and far entries, within a reach.
+        const int reach = int(rng() % 13);
+        std::vector<float> squares(size_t(n) + 2 * size_t(reach));
+        for (float& v : squares) v = rng() % 5 == 0 ? 1e20f : float((rng() % 40) * (rng() % 40));
+        std::vector<float> wantNear(size_t(n), 7.0f);
+        reference.nearRow(squares.data() + reach, reach, n, wantNear.data());
+
+        // The inward row: a padded plane of sources (values above 1 or -inf).
+        const int ir = int(rng() % 5);
+        const size_t plane = size_t(n) + 2 * size_t(ir);
+        std::vector<float> sources = heights(plane * (2 * size_t(ir) + 1), 3.0f);
+        for (float& v : sources) v = v > 1.0f ? v : -INFINITY;
+        std::vector<float> windowRoots;
+        for (int a = -ir; a <= ir; ++a)
+            for (int dx = -ir; dx <= ir; ++dx) windowRoots.push_back(IntSqrt(a * a + dx * dx));
+        const std::vector<float> cur = heights(size_t(n), -2.0f);
+        const float* centre = sources.data() + size_t(ir) * plane + size_t(ir);
+        std::vector<float> wantInward(size_t(n), 7.0f);
+        reference.inwardRow(centre, ptrdiff_t(plane), ir, ir, ir, windowRoots.data(), cur.data(), wantInward.data(), n);
+
+        const float gain = std::array<float, 3>{1.0f, 1.83f, 2.03f}[rng() % 3];
+        const uint32_t firstColour = rng(), secondColour = rng();
+        std::vector<uint32_t> wantWords(size_t(n), 0xDEADBEEFu);
+        reference.colourise(first.data(), second.data(), n, gain, firstColour, secondColour, wantWords.data());
+        const std::vector<uint8_t> mirroredFirst = bytes(size_t(n)), mirroredSecond = bytes(size_t(n));
+        std::vector<uint8_t> coverage = bytes(size_t(n));
+        for (size_t i = 0; i < coverage.size(); i += 3) coverage[i] = i % 2 ? 255 : 0;  // the two shortcuts
+        std::vector<uint32_t> wantTwoSided(size_t(n), 0xDEADBEEFu);
+        reference.twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(), coverage.data(),
+                           n, gain, firstColour, secondColour, wantTwoSided.data());
+
+        for (const auto& v : variants) {
+            std::vector<uint8_t> got[3][2];
+            for (int k = 0; k < 3; ++k) got[k][0] = second, got[k][1] = first;
+            v.table->bevelLight(o, ptrdiff_t(stride), n, light, got[0][0].data(), got[0][1].data());
+            v.table->embossHardLight(o, ptrdiff_t(stride), n, light, got[1][0].data(), got[1][1].data());
+            v.table->embossSoftLight(o, in, ptrdiff_t(stride), n, light, got[2][0].data(), got[2][1].data());
+            for (int k = 0; k < 3; ++k)
+                ASSERT_TRUE(same(got[k][0], want[k][0]) && same(got[k][1], want[k][1]))
+                    << v.name << " light " << k << " width " << n;
+            std::vector<float> gotSwept = swept;
+            v.table->sweepSource(gotSwept.data(), n, n, sourceX, r, 0, rows, left, right, disc, amount);
+            ASSERT_TRUE(same(gotSwept, wantSwept)) << v.name << " sweep width " << n;
+            std::vector<uint8_t> gotSides = sidesPoison;
+            v.table->sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive,
+                                gotSides.data());
+            ASSERT_TRUE(same(gotSides, wantSides)) << v.name << " sides width " << n;
+            std::vector<float> gotNear(size_t(n), 7.0f);
+            v.table->nearRow(squares.data() + reach, reach, n, gotNear.data());
+            ASSERT_TRUE(same(gotNear, wantNear)) << v.name << " near width " << n;
+            std::vector<float> gotInward(size_t(n), 7.0f);
+            v.table->inwardRow(centre, ptrdiff_t(plane), ir, ir, ir, windowRoots.data(), cur.data(), gotInward.data(), n);
+            ASSERT_TRUE(same(gotInward, wantInward)) << v.name << " inward width " << n;
+            std::vector<uint32_t> gotWords(size_t(n), 0xDEADBEEFu);
+            v.table->colourise(first.data(), second.data(), n, gain, firstColour, secondColour, gotWords.data());
+            ASSERT_TRUE(same(gotWords, wantWords)) << v.name << " colours width " << n;
+            std::vector<uint32_t> gotTwoSided(size_t(n), 0xDEADBEEFu);
+            v.table->twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(),
+                              coverage.data(), n, gain, firstColour, secondColour, gotTwoSided.data());
+            ASSERT_TRUE(same(gotTwoSided, wantTwoSided)) << v.name << " two-sided width " << n;
+        }
+    }
 }
 
 TEST(ReliefKernels, LightVectorForAngleAndAltitudePairs) {
