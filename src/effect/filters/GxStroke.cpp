@@ -63,6 +63,7 @@
 
 #include "effect/filters/GxStroke.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
@@ -258,7 +259,7 @@ bool StrokeChords::plan(const unsigned char* k, int D) {
                 if (d < R && row[d + 1] == row[d]) continue;  // the run goes on
                 int span = 0;
                 while ((2 << span) <= 2 * d + 1) ++span;
-                levels_.push_back(Level{d, span, uint8_t(255 - row[d])});
+                levels_.push_back(Level{-d, d - (1 << span) + 1, span, uint8_t(255 - row[d])});
                 widest = d > widest ? d : widest;
             }
             rows_[size_t(ky)].count = int(levels_.size()) - rows_[size_t(ky)].first;
@@ -311,6 +312,27 @@ bool Geometry(int w, int h, int frame, int R, int widest, int spans, size_t leve
     return true;
 }
 
+// The part of a w x h plane placed at (x, y) that lands on `dst` or on
+// `extra` (when given): the bounding box of both, in plane coordinates.
+bool VisiblePart(int x, int y, int w, int h, const GxBitmap* dst, const GxBitmap* extra,
+                 StrokeChords::Window* window) {
+    int64_t left = INT64_MAX, top = INT64_MAX, right = INT64_MIN, bottom = INT64_MIN;
+    for (const GxBitmap* target : {dst, extra}) {
+        if (target == nullptr || target->pixels == nullptr) continue;
+        const int64_t l = std::max<int64_t>(0, -int64_t(x)), t = std::max<int64_t>(0, -int64_t(y));
+        const int64_t r = std::min<int64_t>(w, int64_t(target->width) - x);
+        const int64_t b = std::min<int64_t>(h, int64_t(target->height) - y);
+        if (l >= r || t >= b) continue;
+        left = std::min(left, l);
+        top = std::min(top, t);
+        right = std::max(right, r);
+        bottom = std::max(bottom, b);
+    }
+    if (left >= right || top >= bottom) return false;
+    *window = StrokeChords::Window{int(left), int(top), int(right - left), int(bottom - top)};
+    return true;
+}
+
 }  // namespace
 
 bool StrokeChords::workBytes(int w, int h, int frame, size_t* bytes) const {
@@ -321,18 +343,26 @@ bool StrokeChords::workBytes(int w, int h, int frame, size_t* bytes) const {
 }
 
 void StrokeChords::spread(const unsigned char* source, int stride, int w, int h, int frame, bool inverse,
-                          unsigned char* work, unsigned char* out) const {
+                          unsigned char* work, const Window& window, unsigned char* out, size_t outStride) const {
     SpreadGeometry g;
     if (!planned() || source == nullptr || work == nullptr || out == nullptr ||
         !Geometry(w, h, frame, R_, widest_, spans_, levels_.size(), &g))
+        return;
+    const int outWidth = g.width + D_ - 1, outHeight = g.height + D_ - 1;
+    if (window.left < 0 || window.top < 0 || window.width <= 0 || window.height <= 0 ||
+        window.left > outWidth - window.width || window.top > outHeight - window.height)
         return;
     const StrokeRows::Table& rows = StrokeRows::Active();
     auto* terms = reinterpret_cast<StrokeRows::Term*>(work);
     unsigned char* tables = work + g.terms;
 
+    // The source rows the window reads.
+    const int firstRow = window.top - (D_ - 1) > 0 ? window.top - (D_ - 1) : 0;
+    const int endRow = window.top + window.height < g.height ? window.top + window.height : g.height;
+
     // Span table 0: the framed source (or its inverse) between zeros.
     const unsigned char frameValue = inverse ? 255 : 0;
-    for (int y = 0; y < g.height; ++y) {
+    for (int y = firstRow; y < endRow; ++y) {
         unsigned char* row = tables + size_t(y) * g.pitch;
         std::memset(row, 0, size_t(g.reach));
         unsigned char* framed = row + g.reach;
@@ -358,41 +388,41 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
         const unsigned char* below = tables + size_t(j - 1) * g.table;
         unsigned char* table = tables + size_t(j) * g.table;
         const int n = int(g.pitch) - (1 << j) + 1;
-        for (int y = 0; y < g.height; ++y) {
+        for (int y = firstRow; y < endRow; ++y) {
             const size_t at = size_t(y) * g.pitch;
             rows.maxRow(below + at, below + at + (1 << (j - 1)), n, table + at);
         }
     }
 
     // One output row at a time: the full levels of the kernel rows that
-    // reach a source row, centre first, then every rim level.
-    const int outWidth = g.width + D_ - 1;
-    const int outHeight = g.height + D_ - 1;
+    // reach a source row, centre first, then every rim level. Output column
+    // `window.left` centres on source column window.left - R.
+    const unsigned char* spanBase[32];
+    for (int j = 0; j < spans_; ++j)
+        spanBase[j] = tables + size_t(j) * g.table + size_t(g.reach - R_ + window.left);
     auto term = [&](const Level& level, int sy) {
-        // Output column 0 centres on source column -R.
-        const unsigned char* centre =
-            tables + size_t(level.span) * g.table + size_t(sy) * g.pitch + size_t(g.reach - R_);
-        return StrokeRows::Term{centre - level.width, centre + level.width - (1 << level.span) + 1, level.cut};
+        const unsigned char* centre = spanBase[level.span] + size_t(sy) * g.pitch;
+        return StrokeRows::Term{centre + level.left, centre + level.right, level.cut};
     };
-    for (int y = 0; y < outHeight; ++y) {
+    for (int y = window.top; y < window.top + window.height; ++y) {
+        // Kernel rows ky reach source row y - ky.
+        const int kyFirst = y - (g.height - 1) > 0 ? y - (g.height - 1) : 0;
+        const int kyEnd = y + 1 < D_ ? y + 1 : D_;
         int flat = 0;
         for (int ky : order_) {
-            const int sy = y - ky;
             const Row& r = rows_[size_t(ky)];
-            if (sy < 0 || sy >= g.height || r.count == 0 || levels_[size_t(r.first)].cut != 0) continue;
-            terms[flat++] = term(levels_[size_t(r.first)], sy);
+            if (ky < kyFirst || ky >= kyEnd || r.count == 0 || levels_[size_t(r.first)].cut != 0) continue;
+            terms[flat++] = term(levels_[size_t(r.first)], y - ky);
         }
         int count = flat;
-        for (int ky = 0; ky < D_; ++ky) {
-            const int sy = y - ky;
+        for (int ky = kyFirst; ky < kyEnd; ++ky) {
             const Row& r = rows_[size_t(ky)];
-            if (sy < 0 || sy >= g.height) continue;
             for (int i = 0; i < r.count; ++i) {
                 const Level& level = levels_[size_t(r.first + i)];
-                if (level.cut != 0) terms[count++] = term(level, sy);
+                if (level.cut != 0) terms[count++] = term(level, y - ky);
             }
         }
-        rows.dilateRow(terms, flat, count, outWidth, out + size_t(y) * size_t(outWidth));
+        rows.dilateRow(terms, flat, count, window.width, out + size_t(y - window.top) * outStride);
     }
 }
 
@@ -482,22 +512,31 @@ void GxStroke::doPostProcessing(GxECore::ParamPostProcessing* p) {
         work = ownWork.get();
     }
     if (output == nullptr || work == nullptr) return;
+    // Only what lands on a target is worked out.
+    const int x = rect.left - 1 - R;
+    const int y = rect.top - 1 - R;
+    StrokeChords::Window window;
+    if (!VisiblePart(x, y, int(Wo), int(Ho), p->dst, p->extraDst, &window)) return;
     const unsigned char* corner = src.pixels + size_t(rect.top) * src.width + size_t(rect.left);
     const int stride = int(src.width);
-    chords.spread(corner, stride, textW, textH, 1, position != 0 && position != 1, work, output);
+    unsigned char* visible = output + size_t(window.top) * size_t(Wo) + size_t(window.left);
+    chords.spread(corner, stride, textW, textH, 1, position != 0 && position != 1, work, window, visible,
+                  size_t(Wo));
     if (position == 0) {
-        chords.spread(corner, stride, textW, textH, 1, true, work, output + planeSize);
+        unsigned char* inverse = visible + planeSize;
+        chords.spread(corner, stride, textW, textH, 1, true, work, window, inverse, size_t(Wo));
         const StrokeRows::MinRow band = StrokeRows::Active().minRow;
-        for (int64_t y = 0; y < Ho; ++y)
-            band(output + size_t(y) * size_t(Wo), output + planeSize + size_t(y) * size_t(Wo), int(Wo));
+        for (int row = 0; row < window.height; ++row)
+            band(visible + size_t(row) * size_t(Wo), inverse + size_t(row) * size_t(Wo), window.width);
     }
 
     const int mode = (p->separateWorkImage == 1 || position != 0) ? GxE_BLEND_DST_OVER : GxE_BLEND_SRC_OVER;
-    const int x = rect.left - 1 - R;
-    const int y = rect.top - 1 - R;
-    GxBlender::drawBitmapBlend8(x, y, p->dst, output, int(Wo), int(Ho), int(Wo), property->color, mode);
+    const int left = x + window.left, top = y + window.top;
+    GxBlender::drawBitmapBlend8(left, top, p->dst, visible, window.width, window.height, int(Wo), property->color,
+                                mode);
     if (p->extraDst != nullptr)
-        GxBlender::drawBitmapBlend8(x, y, p->extraDst, output, int(Wo), int(Ho), int(Wo), property->color, mode);
+        GxBlender::drawBitmapBlend8(left, top, p->extraDst, visible, window.width, window.height, int(Wo),
+                                    property->color, mode);
 }
 
 }  // namespace Glimmer

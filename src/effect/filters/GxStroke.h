@@ -61,18 +61,26 @@ public:
     // Work memory spread() needs for a w x h source with a frame of `frame`
     // pixels; false when it does not fit the filters' limits.
     bool workBytes(int w, int h, int frame, size_t* bytes) const;
+    // Part of the output plane: columns [left, left + width), rows [top, top + height).
+    struct Window {
+        int left, top, width, height;
+    };
     // The dilation of the w x h source (rows `stride` bytes apart) inside a
-    // frame of zeros `frame` pixels wide, or of that framed source's inverse,
-    // into `out`: (w + 2 frame + D - 1) x (h + 2 frame + D - 1) bytes, every
-    // one written. Samples outside the frame count as nothing.
+    // frame of zeros `frame` pixels wide, or of that framed source's inverse.
+    // Its plane is (w + 2 frame + D - 1) x (h + 2 frame + D - 1); the bytes of
+    // `window` (which must lie on it) are written to `out`, rows `outStride`
+    // apart. Samples outside the frame count as nothing.
     void spread(const unsigned char* source, int stride, int w, int h, int frame, bool inverse,
-                unsigned char* work, unsigned char* out) const;
+                unsigned char* work, const Window& window, unsigned char* out, size_t outStride) const;
 
 private:
+    // A run of columns centre - w .. centre + w, the larger of the spans of
+    // 2^span samples from centre + left and from centre + right.
     struct Level {
-        int width;     // the run covers columns centre - width .. centre + width
-        int span;      // log2 of the power-of-two spans that cover it
-        uint8_t cut;   // 255 - its coverage
+        int left;     // -w
+        int right;    // w - 2^span + 1
+        int span;
+        uint8_t cut;  // 255 - its coverage
     };
     struct Row {
         int first = 0;  // its levels, narrowest (strongest) first

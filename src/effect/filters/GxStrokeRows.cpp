@@ -2,8 +2,9 @@
 //
 // Vector form: a block of output bytes is built in one register: for every
 // term the two span reads are combined with a byte maximum, the cut is a
-// saturating subtraction, and the block keeps the running maximum. After
-// each pair of flat terms a block that is 255 throughout is stored at once.
+// saturating subtraction, and the block keeps the running maximum. Four
+// blocks go through the terms together; after each pair of flat terms, four
+// blocks that are 255 throughout skip the rest.
 // A row that does not end on a whole block finishes with one block that
 // overlaps the one before it (the bytes it writes twice are the same), so
 // nothing outside [0, n) is read or written; a row narrower than one block
@@ -29,22 +30,39 @@ const Table* GetTable() { return &ReferenceTable(); }
 namespace hn = hwy::HWY_NAMESPACE;
 using D8 = hn::ScalableTag<uint8_t>;
 
-HWY_INLINE hn::Vec<D8> DilateBlock(const Term* terms, int flat, int count, int x) {
+// Blocks [x, x + kBlocks * N): the term's reads and its cut are fetched once
+// for all of them.
+template <int kBlocks>
+HWY_INLINE void DilateBlocks(const Term* HWY_RESTRICT terms, int flat, int count, int x,
+                             uint8_t* HWY_RESTRICT out) {
     const D8 d;
+    const int N = int(hn::Lanes(d));
     const auto full = hn::Set(d, 255);
-    auto acc = hn::Zero(d);
+    hn::Vec<D8> acc[kBlocks];
+    for (int k = 0; k < kBlocks; ++k) acc[k] = hn::Zero(d);
     int i = 0;
-    for (; i + 1 < flat; i += 2) {
-        acc = hn::Max(acc, hn::Max(hn::LoadU(d, terms[i].a + x), hn::LoadU(d, terms[i].b + x)));
-        acc = hn::Max(acc, hn::Max(hn::LoadU(d, terms[i + 1].a + x), hn::LoadU(d, terms[i + 1].b + x)));
-        if (hn::AllTrue(d, hn::Eq(acc, full))) return acc;
+    for (; i < flat; ++i) {
+        const uint8_t* a = terms[i].a + x;
+        const uint8_t* b = terms[i].b + x;
+        for (int k = 0; k < kBlocks; ++k)
+            acc[k] = hn::Max(acc[k], hn::Max(hn::LoadU(d, a + k * N), hn::LoadU(d, b + k * N)));
+        if ((i & 1) == 0) continue;
+        auto least = acc[0];
+        for (int k = 1; k < kBlocks; ++k) least = hn::Min(least, acc[k]);
+        if (hn::AllTrue(d, hn::Eq(least, full))) break;
     }
-    if (i < flat) acc = hn::Max(acc, hn::Max(hn::LoadU(d, terms[i].a + x), hn::LoadU(d, terms[i].b + x)));
-    for (i = flat; i < count; ++i) {
-        const auto chord = hn::Max(hn::LoadU(d, terms[i].a + x), hn::LoadU(d, terms[i].b + x));
-        acc = hn::Max(acc, hn::SaturatedSub(chord, hn::Set(d, terms[i].cut)));
+    if (i >= flat) {
+        for (i = flat; i < count; ++i) {
+            const uint8_t* a = terms[i].a + x;
+            const uint8_t* b = terms[i].b + x;
+            const auto cut = hn::Set(d, terms[i].cut);
+            for (int k = 0; k < kBlocks; ++k) {
+                const auto chord = hn::Max(hn::LoadU(d, a + k * N), hn::LoadU(d, b + k * N));
+                acc[k] = hn::Max(acc[k], hn::SaturatedSub(chord, cut));
+            }
+        }
     }
-    return acc;
+    for (int k = 0; k < kBlocks; ++k) hn::StoreU(acc[k], d, out + x + k * N);
 }
 
 void DilateRow(const Term* HWY_RESTRICT terms, int flat, int count, int n, uint8_t* HWY_RESTRICT out) {
@@ -55,8 +73,9 @@ void DilateRow(const Term* HWY_RESTRICT terms, int flat, int count, int n, uint8
         return;
     }
     int x = 0;
-    for (; x + N <= n; x += N) hn::StoreU(DilateBlock(terms, flat, count, x), d, out + x);
-    if (x < n) hn::StoreU(DilateBlock(terms, flat, count, n - N), d, out + n - N);
+    for (; x + 4 * N <= n; x += 4 * N) DilateBlocks<4>(terms, flat, count, x, out);
+    for (; x + N <= n; x += N) DilateBlocks<1>(terms, flat, count, x, out);
+    if (x < n) DilateBlocks<1>(terms, flat, count, n - N, out);
 }
 
 void MaxRow(const uint8_t* HWY_RESTRICT a, const uint8_t* HWY_RESTRICT b, int n, uint8_t* HWY_RESTRICT out) {

@@ -107,14 +107,32 @@ TEST(StrokeBands, BandsAndChordsAgreeWithPlainStamping) {
                     const uint8_t* inner = pad.data() + frame * (W + 1);
                     size_t bytes = 0;
                     ASSERT_TRUE(chords.workBytes(W - 2 * frame, H - 2 * frame, frame, &bytes));
+                    // The whole plane, or (trial 2) a part of it; every byte of it is written.
+                    const int Wo = W + 2 * R, Ho = H + 2 * R;
+                    StrokeChords::Window window{0, 0, Wo, Ho};
+                    std::vector<uint8_t> expect = want;
+                    if (trial == 2) {
+                        window.left = int(rng() % unsigned(Wo));
+                        window.top = int(rng() % unsigned(Ho));
+                        window.width = 1 + int(rng() % unsigned(Wo - window.left));
+                        window.height = 1 + int(rng() % unsigned(Ho - window.top));
+                        for (int plane = 0; plane < 2; ++plane)
+                            for (int y = 0; y < Ho; ++y)
+                                for (int x = 0; x < Wo; ++x)
+                                    if (x < window.left || x >= window.left + window.width || y < window.top ||
+                                        y >= window.top + window.height)
+                                        expect[size_t(plane) * P + size_t(y) * Wo + x] = 77;
+                    }
                     std::vector<uint8_t> work(bytes), got(size_t(2) * P, 0);
-                    std::fill(got.begin(), got.begin() + (mode == 2 ? 2 : 1) * P, 77);  // every byte is written
+                    std::fill(got.begin(), got.begin() + (mode == 2 ? 2 : 1) * P, 77);
+                    if (mode != 2) std::fill(expect.begin() + P, expect.end(), 0);
                     auto spread = [&](bool inverse, uint8_t* out) {
-                        chords.spread(inner, W, W - 2 * frame, H - 2 * frame, frame, inverse, work.data(), out);
+                        chords.spread(inner, W, W - 2 * frame, H - 2 * frame, frame, inverse, work.data(), window,
+                                      out + size_t(window.top) * Wo + window.left, size_t(Wo));
                     };
                     spread(mode == 1, got.data());
                     if (mode == 2) spread(true, got.data() + P);
-                    ASSERT_EQ(got, want) << "chords r=" << r << " mode=" << mode << " " << W << "x" << H;
+                    ASSERT_EQ(got, expect) << "chords r=" << r << " mode=" << mode << " " << W << "x" << H;
                 }
                 for (int pieces : {1, 3}) {
                     std::vector<uint8_t> got(size_t(2) * P, 0);
