@@ -33,12 +33,72 @@ HWY_INLINE V32 Divide(D32 d32, V32 x, V32 multiplier, int shift) {
 }
 #endif
 
+#if HWY_ARCH_X86 && HWY_TARGET != HWY_SCALAR && HWY_TARGET != HWY_EMU128
+// x86: two taps per multiply. Interleaving the 16-bit samples of taps t and
+// t + 1 puts them side by side in each 32-bit lane, and the pairwise
+// multiply-add (pmaddwd) gives w_t * s_t + w_(t+1) * s_(t+1) for one column
+// per lane: pairs are at most 510 and weights at most 128, so every product
+// and sum stays far inside the signed lanes. The lower and upper interleaves
+// take the columns of each 128-bit block in halves, and the saturating pack
+// at the end (also per block) puts them back in order.
+template <class D16>
+HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n,
+                                const GxGaussian& g, bool inverted, uint8_t* HWY_RESTRICT out) {
+    const int R = g.radius;
+    const int* w = g.weights;
+    const hn::Rebind<uint8_t, D16> d8;
+    const hn::Repartition<int32_t, D16> di32;
+    const hn::Repartition<uint32_t, D16> du32;
+    const hn::Repartition<int16_t, D16> di16;
+    const int N = int(hn::Lanes(d16));
+    const auto multiplier = hn::Set(du32, uint32_t(g.divide.multiplier));
+    const int shift = int(g.divide.shift);
+    const auto full = hn::Set(du32, g.full);
+    const auto most = hn::Set(du32, 255u);
+    // Weights of taps 2k and 2k + 1 as one 32-bit pattern (0 past the last tap).
+    uint32_t pairs[kMaxFilterRadius / 2 + 1];
+    for (int i = 0; i <= R; i += 2) pairs[i / 2] = uint32_t(w[i]) | (i < R ? uint32_t(w[i + 1]) << 16 : 0u);
+    auto pair = [&](const uint8_t* at, ptrdiff_t offset) {
+        return hn::BitCast(di16, hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, at - offset)),
+                                         hn::PromoteTo(d16, hn::LoadU(d8, at + offset))));
+    };
+    int x = 0;
+    for (; x + N <= n; x += N) {
+        const uint8_t* at = c + x;
+        auto lo = hn::Zero(di32), hi = hn::Zero(di32);
+        auto unused = hn::Zero(di32);
+        auto accumulate = [&](hn::Vec<decltype(di16)> a, hn::Vec<decltype(di16)> b, uint32_t weights) {
+            const auto wv = hn::BitCast(di16, hn::Set(du32, weights));
+            lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
+            hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
+        };
+        const auto centre = hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at)));
+        accumulate(centre, R >= 1 ? pair(at, step) : hn::Zero(di16), pairs[0]);
+        int i = 2;
+        for (; i < R; i += 2)
+            accumulate(pair(at, ptrdiff_t(i) * step), pair(at, ptrdiff_t(i + 1) * step), pairs[i / 2]);
+        if (i == R) accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), pairs[i / 2]);
+        auto sumLo = hn::BitCast(du32, lo), sumHi = hn::BitCast(du32, hi);
+        if (inverted) {
+            sumLo = hn::Sub(full, sumLo);
+            sumHi = hn::Sub(full, sumHi);
+        }
+        const auto qLo = hn::BitCast(di32, hn::Min(Divide(du32, sumLo, multiplier, shift), most));
+        const auto qHi = hn::BitCast(di32, hn::Min(Divide(du32, sumHi, multiplier, shift), most));
+        hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, out + x);
+    }
+    return x;
+}
+#endif
+
 void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted,
              uint8_t* HWY_RESTRICT out) {
     const int R = g.radius;
     const int* w = g.weights;
     int x = 0;
-#if HWY_TARGET != HWY_SCALAR
+#if HWY_ARCH_X86 && HWY_TARGET != HWY_SCALAR && HWY_TARGET != HWY_EMU128
+    x = BlurBlocksPaired(hn::ScalableTag<uint16_t>(), c, step, n, g, inverted, out);
+#elif HWY_TARGET != HWY_SCALAR
     const hn::ScalableTag<uint16_t> d16;
     const hn::Rebind<uint8_t, decltype(d16)> d8;
     const hn::Half<decltype(d16)> dh16;
