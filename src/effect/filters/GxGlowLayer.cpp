@@ -1,5 +1,6 @@
 #include "effect/filters/GxGlowLayer.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "effect/GxBlender.h"
@@ -102,6 +103,11 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height) 
 }
 
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch) {
+    return GlowBoxFilter(plane, iterations, width, height, scratch, GxRect(0, 0, width, height));
+}
+
+bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch,
+                   const GxRect& content) {
     if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
     const size_t w = size_t(width);
     // Two rows: the saved row above and the output row.
@@ -116,17 +122,35 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
     if (rows == nullptr) return false;
     unsigned char* saved = rows;
     unsigned char* out = rows + w;
-    out[0] = 0;
-    out[w - 1] = 0;
     const BlurRows::SpreadRow spread = BlurRows::Active().spreadRow;
-    for (int pass = 0; pass < iterations; ++pass) {
-        // `saved` holds the row above as it was before this pass rewrote it.
-        std::memcpy(saved, plane, w);
-        for (int y = 1; y < height - 1; ++y) {
-            unsigned char* row = plane + size_t(y) * w;
-            if (w >= 3) spread(saved, row, row + w, width, out);
-            std::memcpy(saved, row, w);
-            std::memcpy(row, out, w);
+    // A frame of 255 stays 255 beside the 0 at a row's end (6 x 255 / 4 is
+    // past 255), but not between two such ends: planes that narrow are
+    // rewritten in full.
+    const GxRect all(0, 0, width, height);
+    const GxRect& changing = width >= 4 ? content : all;
+    for (int pass = 1; pass <= iterations; ++pass) {
+        // What pass p can change: the content grown by p, inside the rows
+        // and columns a pass rewrites.
+        const int top = std::max(1, changing.top - pass), bottom = std::min(height - 1, changing.bottom + pass);
+        const int left = std::max(1, changing.left - pass), right = std::min(width - 1, changing.right + pass);
+        if (top < bottom && left < right) {
+            const size_t span = size_t(right - left);
+            // `saved` holds the row above as it was before this pass rewrote it.
+            std::memcpy(saved + left - 1, plane + size_t(top - 1) * w + left - 1, span + 2);
+            for (int y = top; y < bottom; ++y) {
+                unsigned char* row = plane + size_t(y) * w;
+                spread(saved + left - 1, row + left - 1, row + w + left - 1, int(span) + 2, out + left - 1);
+                std::memcpy(saved + left - 1, row + left - 1, span + 2);
+                std::memcpy(row + left, out + left, span);
+            }
+        }
+        // Every pass writes 0 at both ends of the rows it rewrites; the
+        // first pass reads the ends as they were.
+        if (pass == 1) {
+            for (int y = 1; y < height - 1; ++y) {
+                plane[size_t(y) * w] = 0;
+                plane[size_t(y) * w + w - 1] = 0;
+            }
         }
     }
     return true;
@@ -225,7 +249,11 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     for (int v = 0; v < kColorTableSize; ++v) shade[v] = PremultiplyColor(table[256 - v]);
 
     FillPlane(plane, plan, *p->src, box, inverted);
-    if (!GlowBoxFilter(plane, plan.iterations, plan.width, plan.height, scratch)) return;
+    // Outside the glyph box the plane holds only its frame value, which a
+    // pass leaves as it is (but for the rows' end bytes).
+    const int32_t inset = 2 * plan.g;
+    const GxRect content(inset, inset, inset + (box.right - box.left), inset + (box.bottom - box.top));
+    if (!GlowBoxFilter(plane, plan.iterations, plan.width, plan.height, scratch, content)) return;
 
     // The box filter is done with the row buffers.
     unsigned char* rows = nullptr;
