@@ -64,11 +64,15 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
 }
 
 // Rows [Rg, H - Rg) of the image, each blurred vertically into a byte row and
-// then horizontally into colour. `frame` fills the columns the horizontal
-// pass cannot reach. `shade[v]` is the premultiplied colour of result v.
-// `row` and `values` are W bytes of scratch.
+// then horizontally into colour. `shade[v]` is the premultiplied colour of
+// result v. `row` and `values` are W bytes of scratch.
+//
+// With a `frame` the image is W x H and the frame fills the rows and columns
+// the passes cannot reach. Without one (a frame of transparent pixels, which
+// destination-over leaves alone) only the part the passes reach is written,
+// as an image of (W - 2 Rg) x (H - 2 Rg).
 void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& plan, const GxGaussian& g,
-                   bool inverted, const uint32_t* shade, uint32_t frame, unsigned char* row,
+                   bool inverted, const uint32_t* shade, const uint32_t* frame, unsigned char* row,
                    unsigned char* values) {
     const int32_t W = plan.width, R = plan.radius;
     const size_t stride = size_t(W);
@@ -82,18 +86,20 @@ void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& 
     for (int32_t y = R; y < plan.height - R; ++y) {
         blur(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R);
         blur(row + R, 1, n, g, inverted, values + R);
-        uint32_t* out = image + size_t(y) * stride;
-        for (int32_t x = 0; x < R; ++x) out[x] = frame;
+        uint32_t* out = frame != nullptr ? image + size_t(y) * stride + R : image + size_t(y - R) * size_t(n);
         // Results never exceed 255, so entry 256 (past the edge colour) is
         // only reached by the rule min(v, 256) on paper.
-        for (int32_t x = R; x < W - R; ++x) out[x] = shade[values[x]];
-        for (int32_t x = W - R; x < W; ++x) out[x] = frame;
+        for (int x = 0; x < n; ++x) out[x] = shade[values[R + x]];
+        if (frame == nullptr) continue;
+        for (int32_t x = 0; x < R; ++x) out[x - R] = *frame;
+        for (int32_t x = 0; x < R; ++x) out[n + x] = *frame;
     }
+    if (frame == nullptr) return;
     const int32_t firstUnprocessed = plan.height - R > R ? plan.height - R : R;
     for (int32_t y = 0; y < R && y < plan.height; ++y)
-        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = frame;
+        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = *frame;
     for (int32_t y = firstUnprocessed; y < plan.height; ++y)
-        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = frame;
+        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = *frame;
 }
 
 }  // namespace
@@ -264,11 +270,19 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
         rows = ownRows.get();
     }
     if (rows == nullptr) return;
-    BlurAndColour(plane, image, plan, gaussian, inverted, shade, inverted ? 0xFFFFFFFFu : 0u, rows,
+    // The inner glow's frame is opaque white; the outer glow's is
+    // transparent, so only the part the passes reach is drawn.
+    const uint32_t white = 0xFFFFFFFFu;
+    BlurAndColour(plane, image, plan, gaussian, inverted, shade, inverted ? &white : nullptr, rows,
                   rows + plan.width);
-
-    GxBlender::drawBitmapBlend32(box.left - 2 * plan.g, box.top - 2 * plan.g, p->dst, image,
-                                 plan.width, plan.height, plan.width, GxE_BLEND_DST_OVER);
+    const int left = box.left - 2 * plan.g, top = box.top - 2 * plan.g;
+    if (inverted) {
+        GxBlender::drawBitmapBlend32(left, top, p->dst, image, plan.width, plan.height, plan.width,
+                                     GxE_BLEND_DST_OVER);
+    } else {
+        const int R = plan.radius, w = plan.width - 2 * R, h = plan.height - 2 * R;
+        GxBlender::drawBitmapBlend32(left + R, top + R, p->dst, image, w, h, w, GxE_BLEND_DST_OVER);
+    }
 }
 
 }  // namespace Glimmer
