@@ -25,8 +25,9 @@
 // text fill's (sum + 1) * m, up to 511 * 255) saturates through its high half.
 // The final unpremultiply divides by the new alpha through kReciprocals (see
 // GxBlendRows.h) with 32-bit products. Blocks that cannot change are passed
-// over: no coverage at all, or (unpremultiply with the text fully opaque)
-// only opaque and clear pixels. Pixels past the last whole vector go to
+// over: no coverage at all, transparent black in the unpremultiply, or (with
+// the text fully opaque) only opaque and clear pixels, which need no
+// division. Pixels past the last whole vector go to
 // the reference, as does every row in the fallback build for x86-64 CPUs
 // without SSE4 (Highway's one-lane "scalar" target).
 
@@ -307,8 +308,15 @@ void UnpremultiplyRows(uint8_t* d, int n, uint32_t alpha) {
         hn::StoreU(hn::IfThenZeroElse(hn::Eq(a1, zero), finish(w1)), dw, w + words);
         return true;
     };
+    // A block of transparent black stays as it is whatever the alpha (its
+    // new alpha is 0, and so is its colour): nothing to write.
+    auto clear = [&](const uint8_t* p) {
+        const auto* w = reinterpret_cast<const uint32_t*>(p);
+        return hn::AllTrue(dw, hn::Eq(hn::Or(hn::LoadU(dw, w), hn::LoadU(dw, w + words)), hn::Zero(dw)));
+    };
     const int done = Blocks(n, [&](int i) {
         uint8_t* p = d + 4 * size_t(i);
+        if (clear(p)) return;
         if (plain && opaqueOrClear(p)) return;
         const Px D = LoadPx(p);
         const V a = Scale(D.a, t);
