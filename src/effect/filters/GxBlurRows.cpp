@@ -62,22 +62,7 @@ HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_
         return hn::BitCast(di16, hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, at - offset)),
                                          hn::PromoteTo(d16, hn::LoadU(d8, at + offset))));
     };
-    int x = 0;
-    for (; x + N <= n; x += N) {
-        const uint8_t* at = c + x;
-        auto lo = hn::Zero(di32), hi = hn::Zero(di32);
-        auto unused = hn::Zero(di32);
-        auto accumulate = [&](hn::Vec<decltype(di16)> a, hn::Vec<decltype(di16)> b, uint32_t weights) {
-            const auto wv = hn::BitCast(di16, hn::Set(du32, weights));
-            lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
-            hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
-        };
-        const auto centre = hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at)));
-        accumulate(centre, R >= 1 ? pair(at, step) : hn::Zero(di16), pairs[0]);
-        int i = 2;
-        for (; i < R; i += 2)
-            accumulate(pair(at, ptrdiff_t(i) * step), pair(at, ptrdiff_t(i + 1) * step), pairs[i / 2]);
-        if (i == R) accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), pairs[i / 2]);
+    auto finish = [&](hn::Vec<decltype(di32)> lo, hn::Vec<decltype(di32)> hi, uint8_t* to) {
         auto sumLo = hn::BitCast(du32, lo), sumHi = hn::BitCast(du32, hi);
         if (inverted) {
             sumLo = hn::Sub(full, sumLo);
@@ -85,7 +70,52 @@ HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_
         }
         const auto qLo = hn::BitCast(di32, hn::Min(Divide(du32, sumLo, multiplier, shift), most));
         const auto qHi = hn::BitCast(di32, hn::Min(Divide(du32, sumHi, multiplier, shift), most));
-        hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, out + x);
+        hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, to);
+    };
+    using V16 = hn::Vec<decltype(di16)>;
+    using V32 = hn::Vec<decltype(di32)>;
+    auto unused = hn::Zero(di32);
+    auto accumulate = [&](V16 a, V16 b, V16 wv, V32& lo, V32& hi) {
+        lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
+        hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
+    };
+    auto weightsOf = [&](int i) { return hn::BitCast(di16, hn::Set(du32, pairs[i / 2])); };
+    int x = 0;
+    // Two blocks at a time share the weights and the loop.
+    for (; x + 2 * N <= n; x += 2 * N) {
+        const uint8_t* at = c + x;
+        auto lo0 = hn::Zero(di32), hi0 = hn::Zero(di32), lo1 = hn::Zero(di32), hi1 = hn::Zero(di32);
+        const auto first = R >= 1 ? step : 0;
+        const auto w0 = weightsOf(0);
+        accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at))),
+                   R >= 1 ? pair(at, first) : hn::Zero(di16), w0, lo0, hi0);
+        accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at + N))),
+                   R >= 1 ? pair(at + N, first) : hn::Zero(di16), w0, lo1, hi1);
+        int i = 2;
+        for (; i < R; i += 2) {
+            const auto wv = weightsOf(i);
+            const ptrdiff_t o0 = ptrdiff_t(i) * step, o1 = o0 + step;
+            accumulate(pair(at, o0), pair(at, o1), wv, lo0, hi0);
+            accumulate(pair(at + N, o0), pair(at + N, o1), wv, lo1, hi1);
+        }
+        if (i == R) {
+            const auto wv = weightsOf(i);
+            accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), wv, lo0, hi0);
+            accumulate(pair(at + N, ptrdiff_t(R) * step), hn::Zero(di16), wv, lo1, hi1);
+        }
+        finish(lo0, hi0, out + x);
+        finish(lo1, hi1, out + x + N);
+    }
+    for (; x + N <= n; x += N) {
+        const uint8_t* at = c + x;
+        auto lo = hn::Zero(di32), hi = hn::Zero(di32);
+        accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at))), R >= 1 ? pair(at, step) : hn::Zero(di16),
+                   weightsOf(0), lo, hi);
+        int i = 2;
+        for (; i < R; i += 2)
+            accumulate(pair(at, ptrdiff_t(i) * step), pair(at, ptrdiff_t(i + 1) * step), weightsOf(i), lo, hi);
+        if (i == R) accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), weightsOf(i), lo, hi);
+        finish(lo, hi, out + x);
     }
     return x;
 }
