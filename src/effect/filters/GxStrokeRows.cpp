@@ -2,9 +2,10 @@
 //
 // Vector form: a block of output bytes is built in one register: for every
 // term the two span reads are combined with a byte maximum, the cut is a
-// saturating subtraction, and the block keeps the running maximum. Four
-// blocks go through the terms together; after each pair of flat terms, four
-// blocks that are 255 throughout skip the rest.
+// saturating subtraction, and the block keeps the running maximum. Two
+// blocks go through the terms together (more would rarely all fill up);
+// after each pair of flat terms, blocks that are 255 throughout skip the
+// rest.
 // A row that does not end on a whole block finishes with one block that
 // overlaps the one before it (the bytes it writes twice are the same), so
 // nothing outside [0, n) is read or written; a row narrower than one block
@@ -73,7 +74,7 @@ void DilateRow(const Term* HWY_RESTRICT terms, int flat, int count, int n, uint8
         return;
     }
     int x = 0;
-    for (; x + 4 * N <= n; x += 4 * N) DilateBlocks<4>(terms, flat, count, x, out);
+    for (; x + 2 * N <= n; x += 2 * N) DilateBlocks<2>(terms, flat, count, x, out);
     for (; x + N <= n; x += N) DilateBlocks<1>(terms, flat, count, x, out);
     if (x < n) DilateBlocks<1>(terms, flat, count, n - N, out);
 }
