@@ -63,43 +63,54 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
     }
 }
 
-// Rows [Rg, H - Rg) of the image, each blurred vertically into a byte row and
-// then horizontally into colour. `shade[v]` is the premultiplied colour of
-// result v. `row` and `values` are W bytes of scratch.
+// The glow image, one row at a time, drawn destination-over into `dst` with
+// its top-left corner at (left, top) as it is made (each pixel of `dst` takes
+// one image pixel, so the row order changes nothing). Rows [Rg, H - Rg) are
+// blurred vertically into a byte row and then horizontally into colour;
+// `shade[v]` is the premultiplied colour of result v. `row` and `values` are
+// W bytes of scratch, `colours` W words.
 //
 // With a `frame` the image is W x H and the frame fills the rows and columns
 // the passes cannot reach. Without one (a frame of transparent pixels, which
-// destination-over leaves alone) only the part the passes reach is written,
-// as an image of (W - 2 Rg) x (H - 2 Rg).
-void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& plan, const GxGaussian& g,
-                   bool inverted, const uint32_t* shade, const uint32_t* frame, unsigned char* row,
-                   unsigned char* values) {
+// destination-over leaves alone) only the part the passes reach is drawn.
+void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const GxGaussian& g, bool inverted,
+                       const uint32_t* shade, const uint32_t* frame, const GxBitmap* dst, int left, int top,
+                       unsigned char* row, unsigned char* values, uint32_t* colours) {
     const int32_t W = plan.width, R = plan.radius;
     const size_t stride = size_t(W);
     const int n = W - 2 * R;
     const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
+    auto draw = [&](int y, const uint32_t* from, int x, int count) {
+        GxBlender::drawBitmapBlend32(left + x, top + y, dst, from, count, 1, count, GxE_BLEND_DST_OVER);
+    };
+    if (frame != nullptr) {
+        for (int32_t x = 0; x < W; ++x) colours[x] = *frame;
+        for (int32_t y = 0; y < R && y < plan.height; ++y) draw(y, colours, 0, W);
+    }
     // Columns outside [R, W - R) of the byte row are never computed and read
     // as 0 (no coverage): they lie in the frame, 2g from the glyphs. For the
     // inner glow this matters at one place: the box filter's 0 in the plane's
     // first and last column is not blurred back in as "inside".
     std::memset(row, 0, stride);
+    // Rows that land off `dst` are not worked out.
+    const int64_t firstVisible = -int64_t(top), endVisible = int64_t(dst->height) - top;
     for (int32_t y = R; y < plan.height - R; ++y) {
+        if (y < firstVisible || y >= endVisible) continue;
         blur(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R);
         blur(row + R, 1, n, g, inverted, values + R);
-        uint32_t* out = frame != nullptr ? image + size_t(y) * stride + R : image + size_t(y - R) * size_t(n);
         // Results never exceed 255, so entry 256 (past the edge colour) is
         // only reached by the rule min(v, 256) on paper.
-        for (int x = 0; x < n; ++x) out[x] = shade[values[R + x]];
-        if (frame == nullptr) continue;
-        for (int32_t x = 0; x < R; ++x) out[x - R] = *frame;
-        for (int32_t x = 0; x < R; ++x) out[n + x] = *frame;
+        for (int32_t x = R; x < W - R; ++x) colours[x] = shade[values[x]];
+        if (frame != nullptr) {
+            draw(y, colours, 0, W);  // the frame columns still hold the frame
+        } else {
+            draw(y, colours + R, R, n);
+        }
     }
     if (frame == nullptr) return;
+    for (int32_t x = R; x < W - R; ++x) colours[x] = *frame;
     const int32_t firstUnprocessed = plan.height - R > R ? plan.height - R : R;
-    for (int32_t y = 0; y < R && y < plan.height; ++y)
-        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = *frame;
-    for (int32_t y = firstUnprocessed; y < plan.height; ++y)
-        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = *frame;
+    for (int32_t y = firstUnprocessed; y < plan.height; ++y) draw(y, colours, 0, W);
 }
 
 }  // namespace
@@ -233,20 +244,20 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     if (!PlanGaussian(&gaussian, plan.radius, kGlowGaussianCentre, GaussianRounding::kDouble)) return;
     // Work memory: the stack's when it lends it, else our own for this call.
     GxScratch* scratch = p->scratch;
-    WorkBuffer<uint32_t> ownImage;
+    WorkBuffer<uint32_t> ownColours;
     WorkBuffer<unsigned char> ownPlane, ownRows;
-    uint32_t* image = nullptr;
+    uint32_t* colours = nullptr;
     unsigned char* plane = nullptr;
     if (scratch != nullptr) {
-        image = scratch->get<uint32_t>(GxScratch::kPlaneA, plan.pixels);
+        colours = scratch->get<uint32_t>(GxScratch::kPlaneA, size_t(plan.width));
         plane = scratch->get<unsigned char>(GxScratch::kPlaneB, plan.pixels);
     } else {
-        ownImage = AllocateWork<uint32_t>(plan.pixels);
+        ownColours = AllocateWork<uint32_t>(size_t(plan.width));
         ownPlane = AllocateWork<unsigned char>(plan.pixels);
-        image = ownImage.get();
+        colours = ownColours.get();
         plane = ownPlane.get();
     }
-    if (image == nullptr || plane == nullptr) return;
+    if (colours == nullptr || plane == nullptr) return;
 
     uint32_t table[kColorTableSize];
     makeColorLUT(table, 0.3f, kRampLinear);
@@ -273,16 +284,8 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     // The inner glow's frame is opaque white; the outer glow's is
     // transparent, so only the part the passes reach is drawn.
     const uint32_t white = 0xFFFFFFFFu;
-    BlurAndColour(plane, image, plan, gaussian, inverted, shade, inverted ? &white : nullptr, rows,
-                  rows + plan.width);
-    const int left = box.left - 2 * plan.g, top = box.top - 2 * plan.g;
-    if (inverted) {
-        GxBlender::drawBitmapBlend32(left, top, p->dst, image, plan.width, plan.height, plan.width,
-                                     GxE_BLEND_DST_OVER);
-    } else {
-        const int R = plan.radius, w = plan.width - 2 * R, h = plan.height - 2 * R;
-        GxBlender::drawBitmapBlend32(left + R, top + R, p->dst, image, w, h, w, GxE_BLEND_DST_OVER);
-    }
+    BlurColourAndDraw(plane, plan, gaussian, inverted, shade, inverted ? &white : nullptr, p->dst,
+                      box.left - 2 * plan.g, box.top - 2 * plan.g, rows, rows + plan.width, colours);
 }
 
 }  // namespace Glimmer
