@@ -202,8 +202,25 @@ void SpreadRow(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT ro
     }
 }
 
+void ShadeRow(const uint8_t* HWY_RESTRICT values, int n, const uint32_t* HWY_RESTRICT table,
+              uint32_t* HWY_RESTRICT out) {
+    int x = 0;
+#if HWY_TARGET != HWY_SCALAR
+    const hn::ScalableTag<int32_t> di32;
+    const hn::Rebind<uint8_t, decltype(di32)> d8;
+    const hn::Rebind<uint32_t, decltype(di32)> du32;
+    const int N = int(hn::Lanes(di32));
+    const auto* words = reinterpret_cast<const int32_t*>(table);
+    for (; x + N <= n; x += N) {
+        const auto index = hn::BitCast(di32, hn::PromoteTo(du32, hn::LoadU(d8, values + x)));
+        hn::StoreU(hn::BitCast(du32, hn::GatherIndex(di32, words, index)), du32, out + x);
+    }
+#endif
+    for (; x < n; ++x) out[x] = table[values[x]];
+}
+
 const Table* GetTable() {
-    static const Table table = {BlurRow, SpreadRow};
+    static const Table table = {BlurRow, SpreadRow, ShadeRow};
     return &table;
 }
 
@@ -227,6 +244,9 @@ void BlurRow(const uint8_t* c, ptrdiff_t step, int n, const GxGaussian& g, bool 
         out[x] = uint8_t(v < 255 ? v : 255);
     }
 }
+void ShadeRow(const uint8_t* values, int n, const uint32_t* table, uint32_t* out) {
+    for (int x = 0; x < n; ++x) out[x] = table[values[x]];
+}
 void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out) {
     for (int x = 1; x + 1 < width; ++x) {
         unsigned s = 0;
@@ -238,7 +258,7 @@ void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, i
 }  // namespace Reference
 
 const Table& ReferenceTable() {
-    static const Table table = {Reference::BlurRow, Reference::SpreadRow};
+    static const Table table = {Reference::BlurRow, Reference::SpreadRow, Reference::ShadeRow};
     return table;
 }
 

@@ -80,6 +80,7 @@ void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const G
     const size_t stride = size_t(W);
     const int n = W - 2 * R;
     const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
+    const BlurRows::ShadeRow colour = BlurRows::Active().shadeRow;
     auto draw = [&](int y, const uint32_t* from, int x, int count) {
         GxBlender::drawBitmapBlend32(left + x, top + y, dst, from, count, 1, count, GxE_BLEND_DST_OVER);
     };
@@ -100,7 +101,7 @@ void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const G
         blur(row + R, 1, n, g, inverted, values + R);
         // Results never exceed 255, so entry 256 (past the edge colour) is
         // only reached by the rule min(v, 256) on paper.
-        for (int32_t x = R; x < W - R; ++x) colours[x] = shade[values[x]];
+        colour(values + R, n, shade, colours + R);
         if (frame != nullptr) {
             draw(y, colours, 0, W);  // the frame columns still hold the frame
         } else {
