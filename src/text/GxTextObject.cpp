@@ -36,7 +36,6 @@
 #include <type_traits>
 #include <vector>
 
-#include "effect/GxBlender.h"
 #include "effect/GxEffect.h"
 #include "font/FontManager.h"
 #include "foundation/Error.h"
