@@ -52,9 +52,11 @@
 // (kernel row, level) thus costs two reads a pixel whatever its length, and
 // a whole block of pixels goes through it at once (GxStrokeRows). The full
 // levels (t = 255, the disc's inside) come first, centre row outward, and a
-// block that they fill to 255 is finished without the rim levels. An output
-// pixel costs at most D full terms and a few rim terms per row; inside and
-// far outside the band most blocks stop after the first few.
+// block that they fill to 255 is finished without the rim levels. Blocks
+// inside the stroke mostly fill up after a few terms; blocks that stay
+// below 255 (along the stroke's outer edge and beyond it) read all D full
+// terms and every rim term, so there the cost still grows with the radius.
+// Only the part of the output that lands on a target is worked out.
 //
 // Every disc makeCircleKernel makes has that shape: distances only grow
 // along a row, the float steps that turn them into bytes never reverse an
