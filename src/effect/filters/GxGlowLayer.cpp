@@ -128,7 +128,7 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
                    const GxRect& content) {
     if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
     const size_t w = size_t(width);
-    // Two rows: the saved row above and the output row.
+    // Two rows for new values on their way back into the plane.
     WorkBuffer<unsigned char> own;
     unsigned char* rows = nullptr;
     if (scratch != nullptr) {
@@ -138,8 +138,6 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
         rows = own.get();
     }
     if (rows == nullptr) return false;
-    unsigned char* saved = rows;
-    unsigned char* out = rows + w;
     const BlurRows::SpreadRow spread = BlurRows::Active().spreadRow;
     // A frame of 255 stays 255 beside the 0 at a row's end (6 x 255 / 4 is
     // past 255), but not between two such ends: planes that narrow are
@@ -153,14 +151,15 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
         const int left = std::max(1, changing.left - pass), right = std::min(width - 1, changing.right + pass);
         if (top < bottom && left < right) {
             const size_t span = size_t(right - left);
-            // `saved` holds the row above as it was before this pass rewrote it.
-            std::memcpy(saved + left - 1, plane + size_t(top - 1) * w + left - 1, span + 2);
+            // Each new row waits in one of two buffers until the row below
+            // it has been worked out, which reads it as it was.
             for (int y = top; y < bottom; ++y) {
                 unsigned char* row = plane + size_t(y) * w;
-                spread(saved + left - 1, row + left - 1, row + w + left - 1, int(span) + 2, out + left - 1);
-                std::memcpy(saved + left - 1, row + left - 1, span + 2);
-                std::memcpy(row + left, out + left, span);
+                unsigned char* out = rows + size_t(y & 1) * w;
+                spread(row - w + left - 1, row + left - 1, row + w + left - 1, int(span) + 2, out + left - 1);
+                if (y > top) std::memcpy(row - w + left, rows + size_t((y - 1) & 1) * w + left, span);
             }
+            std::memcpy(plane + size_t(bottom - 1) * w + left, rows + size_t((bottom - 1) & 1) * w + left, span);
         }
         // Every pass writes 0 at both ends of the rows it rewrites; the
         // first pass reads the ends as they were.
