@@ -1,9 +1,12 @@
 // The blur row kernel, once per instruction set (see GxBlurRows.h).
 //
+// The glow's spread and colouring follow at the end.
+//
 // Vector form: 8-bit taps are widened to 16 bits, the two taps of a pair
 // added (at most 510) and multiplied by their weight (at most 128, so the
 // product stays below 2^16), and the products summed in 32-bit lanes, half a
-// vector each. The division is GxDivisor's (x * m) >> s with a 64-bit product:
+// vector each; on x86 two such pairs share one pairwise multiply-add
+// (BlurBlocksPaired). The division is GxDivisor's (x * m) >> s with a 64-bit product:
 // even and odd 32-bit lanes are multiplied apart (MulEven) and put back
 // together. Columns past the last whole vector take the scalar form of the
 // same arithmetic, as does the whole row in the fallback build for x86-64 CPUs
