@@ -227,8 +227,30 @@ HWY_INLINE Px DstOverPixels(const Px& D, const Px& S, bool copyOverClear) {
 }
 
 void DstOver32To32(uint8_t* d, const uint32_t* src, int n) {
+    // Blocks whose destination is all opaque stay as they are; over an all
+    // transparent one each source word is copied (red and blue trade places
+    // between 0xAARRGGBB words and R, G, B, A bytes), but where its alpha is
+    // 0 too, which leaves the destination alone.
+    const hn::ScalableTag<uint32_t> dw;
+    const size_t words = hn::Lanes(dw);  // half a block
+    const auto full = hn::Set(dw, 255u), zero = hn::Zero(dw);
+    auto swapped = [&](hn::Vec<decltype(dw)> v) {
+        return hn::Or(hn::And(v, hn::Set(dw, 0xFF00FF00u)),
+                      hn::Or(hn::ShiftLeft<16>(hn::And(v, hn::Set(dw, 0xFFu))),
+                             hn::And(hn::ShiftRight<16>(v), hn::Set(dw, 0xFFu))));
+    };
     const int done = Blocks(n, [&](int i) {
         uint8_t* p = d + 4 * size_t(i);
+        auto* w = reinterpret_cast<uint32_t*>(p);
+        const auto d0 = hn::LoadU(dw, w), d1 = hn::LoadU(dw, w + words);
+        const auto a0 = hn::ShiftRight<24>(d0), a1 = hn::ShiftRight<24>(d1);
+        if (hn::AllTrue(dw, hn::Eq(hn::And(a0, a1), full))) return;
+        if (hn::AllTrue(dw, hn::Eq(hn::Or(a0, a1), zero))) {
+            const auto s0 = hn::LoadU(dw, src + i), s1 = hn::LoadU(dw, src + i + words);
+            hn::StoreU(hn::IfThenElse(hn::Eq(hn::ShiftRight<24>(s0), zero), d0, swapped(s0)), dw, w);
+            hn::StoreU(hn::IfThenElse(hn::Eq(hn::ShiftRight<24>(s1), zero), d1, swapped(s1)), dw, w + words);
+            return;
+        }
         StorePx(DstOverPixels(LoadPx(p), LoadWords(src + i), true), p);
     });
     Scalar::DstOver32To32(d + 4 * size_t(done), src + done, n - done);
