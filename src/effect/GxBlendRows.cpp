@@ -164,10 +164,26 @@ void DstOverSA8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c1 = {Const(((color >> 16) & 0xFF) + 1), Const(((color >> 8) & 0xFF) + 1), Const((color & 0xFF) + 1),
                    Const((color >> 24) + 1)};
     const V one = Const(1);
+    // Full coverage over a transparent destination: the colour at coverage
+    // 255, the same word for the whole block.
+    const hn::ScalableTag<uint32_t> dw;
+    const size_t words = hn::Lanes(dw);  // half a block
+    auto atFull = [&](uint32_t v) { return ((v + 1) * 255) >> 8; };
+    const auto solid = hn::Set(dw, atFull(color >> 24) << 24 | atFull(color & 0xFF) << 16 |
+                                       atFull((color >> 8) & 0xFF) << 8 | atFull((color >> 16) & 0xFF));
     const int done = Blocks(n, [&](int i) {
         const V m = Coverage(cov + i);
         if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
+        if (hn::AllTrue(D16(), hn::Eq(m, Const(255)))) {
+            auto* w = reinterpret_cast<uint32_t*>(p);
+            const auto a = hn::Or(hn::ShiftRight<24>(hn::LoadU(dw, w)), hn::ShiftRight<24>(hn::LoadU(dw, w + words)));
+            if (hn::AllTrue(dw, hn::Eq(a, hn::Zero(dw)))) {
+                hn::StoreU(solid, dw, w);
+                hn::StoreU(solid, dw, w + words);
+                return;
+            }
+        }
         const Px D = LoadPx(p);
         // (v + 1) * m stays below 2^16 for bytes: no saturation needed here.
         const Px S = {hn::ShiftRight<8>(hn::Mul(c1.r, m)), hn::ShiftRight<8>(hn::Mul(c1.g, m)),
