@@ -175,6 +175,7 @@ BENCHMARK_CAPTURE(BM_Stroke, outside_4, 1, 4.0f)->Arg(0)->Arg(1)->Unit(benchmark
 BENCHMARK_CAPTURE(BM_Stroke, centre_4, 0, 4.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(BM_Stroke, inside_4, 2, 4.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(BM_Stroke, outside_16, 1, 16.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
+BENCHMARK_CAPTURE(BM_Stroke, outside_64, 1, 64.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(BM_OuterShadow, size_8, 8.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(BM_OuterShadow, size_30, 30.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(BM_InnerShadow, size_8, 8.0f)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);

@@ -25,8 +25,9 @@
 // text fill's (sum + 1) * m, up to 511 * 255) saturates through its high half.
 // The final unpremultiply divides by the new alpha through kReciprocals (see
 // GxBlendRows.h) with 32-bit products. Blocks that cannot change are passed
-// over: no coverage at all, or (unpremultiply with the text fully opaque)
-// only opaque and clear pixels. Pixels past the last whole vector go to
+// over: no coverage at all, transparent black in the unpremultiply, or (with
+// the text fully opaque) only opaque and clear pixels, which need no
+// division. Pixels past the last whole vector go to
 // the reference, as does every row in the fallback build for x86-64 CPUs
 // without SSE4 (Highway's one-lane "scalar" target).
 
@@ -163,10 +164,26 @@ void DstOverSA8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c1 = {Const(((color >> 16) & 0xFF) + 1), Const(((color >> 8) & 0xFF) + 1), Const((color & 0xFF) + 1),
                    Const((color >> 24) + 1)};
     const V one = Const(1);
+    // Full coverage over a transparent destination: the colour at coverage
+    // 255, the same word for the whole block.
+    const hn::ScalableTag<uint32_t> dw;
+    const size_t words = hn::Lanes(dw);  // half a block
+    auto atFull = [&](uint32_t v) { return ((v + 1) * 255) >> 8; };
+    const auto solid = hn::Set(dw, atFull(color >> 24) << 24 | atFull(color & 0xFF) << 16 |
+                                       atFull((color >> 8) & 0xFF) << 8 | atFull((color >> 16) & 0xFF));
     const int done = Blocks(n, [&](int i) {
         const V m = Coverage(cov + i);
         if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
+        if (hn::AllTrue(D16(), hn::Eq(m, Const(255)))) {
+            auto* w = reinterpret_cast<uint32_t*>(p);
+            const auto a = hn::Or(hn::ShiftRight<24>(hn::LoadU(dw, w)), hn::ShiftRight<24>(hn::LoadU(dw, w + words)));
+            if (hn::AllTrue(dw, hn::Eq(a, hn::Zero(dw)))) {
+                hn::StoreU(solid, dw, w);
+                hn::StoreU(solid, dw, w + words);
+                return;
+            }
+        }
         const Px D = LoadPx(p);
         // (v + 1) * m stays below 2^16 for bytes: no saturation needed here.
         const Px S = {hn::ShiftRight<8>(hn::Mul(c1.r, m)), hn::ShiftRight<8>(hn::Mul(c1.g, m)),
@@ -226,8 +243,30 @@ HWY_INLINE Px DstOverPixels(const Px& D, const Px& S, bool copyOverClear) {
 }
 
 void DstOver32To32(uint8_t* d, const uint32_t* src, int n) {
+    // Blocks whose destination is all opaque stay as they are; over an all
+    // transparent one each source word is copied (red and blue trade places
+    // between 0xAARRGGBB words and R, G, B, A bytes), but where its alpha is
+    // 0 too, which leaves the destination alone.
+    const hn::ScalableTag<uint32_t> dw;
+    const size_t words = hn::Lanes(dw);  // half a block
+    const auto full = hn::Set(dw, 255u), zero = hn::Zero(dw);
+    auto swapped = [&](hn::Vec<decltype(dw)> v) {
+        return hn::Or(hn::And(v, hn::Set(dw, 0xFF00FF00u)),
+                      hn::Or(hn::ShiftLeft<16>(hn::And(v, hn::Set(dw, 0xFFu))),
+                             hn::And(hn::ShiftRight<16>(v), hn::Set(dw, 0xFFu))));
+    };
     const int done = Blocks(n, [&](int i) {
         uint8_t* p = d + 4 * size_t(i);
+        auto* w = reinterpret_cast<uint32_t*>(p);
+        const auto d0 = hn::LoadU(dw, w), d1 = hn::LoadU(dw, w + words);
+        const auto a0 = hn::ShiftRight<24>(d0), a1 = hn::ShiftRight<24>(d1);
+        if (hn::AllTrue(dw, hn::Eq(hn::And(a0, a1), full))) return;
+        if (hn::AllTrue(dw, hn::Eq(hn::Or(a0, a1), zero))) {
+            const auto s0 = hn::LoadU(dw, src + i), s1 = hn::LoadU(dw, src + i + words);
+            hn::StoreU(hn::IfThenElse(hn::Eq(hn::ShiftRight<24>(s0), zero), d0, swapped(s0)), dw, w);
+            hn::StoreU(hn::IfThenElse(hn::Eq(hn::ShiftRight<24>(s1), zero), d1, swapped(s1)), dw, w + words);
+            return;
+        }
         StorePx(DstOverPixels(LoadPx(p), LoadWords(src + i), true), p);
     });
     Scalar::DstOver32To32(d + 4 * size_t(done), src + done, n - done);
@@ -307,8 +346,15 @@ void UnpremultiplyRows(uint8_t* d, int n, uint32_t alpha) {
         hn::StoreU(hn::IfThenZeroElse(hn::Eq(a1, zero), finish(w1)), dw, w + words);
         return true;
     };
+    // A block of transparent black stays as it is whatever the alpha (its
+    // new alpha is 0, and so is its colour): nothing to write.
+    auto clear = [&](const uint8_t* p) {
+        const auto* w = reinterpret_cast<const uint32_t*>(p);
+        return hn::AllTrue(dw, hn::Eq(hn::Or(hn::LoadU(dw, w), hn::LoadU(dw, w + words)), hn::Zero(dw)));
+    };
     const int done = Blocks(n, [&](int i) {
         uint8_t* p = d + 4 * size_t(i);
+        if (clear(p)) return;
         if (plain && opaqueOrClear(p)) return;
         const Px D = LoadPx(p);
         const V a = Scale(D.a, t);

@@ -36,7 +36,6 @@
 #include <type_traits>
 #include <vector>
 
-#include "effect/GxBlender.h"
 #include "effect/GxEffect.h"
 #include "font/FontManager.h"
 #include "foundation/Error.h"
@@ -515,19 +514,19 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
 
     // Two images take turns, so a render allocates nothing once the size is
     // known and never hands out the previous result's pixels again (they were
-    // promised until this render only). Without background boxes the cleared
-    // result would take the effect picture as it is inside the clip
-    // (source-over onto transparent black copies a pixel exactly, and the
-    // stack leaves its transparent pixels all 0), so the
-    // effect picture becomes the result in place: the stack leaves it in word
-    // order and the pixels outside the clip are cleared. With boxes a second
-    // image takes the background and the effect picture is drawn over it.
+    // promised until this render only). The stack leaves the effect picture
+    // in word order. Without background boxes the cleared result would take
+    // it as it is inside the clip (source-over onto transparent black copies a
+    // pixel exactly, and the stack leaves its transparent pixels all 0), so
+    // the effect picture becomes the result in place and the pixels outside
+    // the clip are cleared. With boxes a second image takes the background
+    // and the effect picture is drawn over it.
     const bool boxes = M->hasBackground && M->lineInfo != nullptr && M->lineInfo->GetCount() > 0;
     GxBitmap* effectBitmap =
         ImageOfSize(boxes ? &M->result : &M->spareImage, unsigned(width), unsigned(height), true);
     if (effectBitmap == nullptr) return nullptr;
 
-    if (M->effect != nullptr) M->effect->setWordOrderOutput(!boxes);
+    if (M->effect != nullptr) M->effect->setWordOrderOutput(true);
     M->fontDrawing->DrawTextEffect(this, effectBitmap);
     if (M->effect != nullptr) M->effect->setWordOrderOutput(false);
 
@@ -564,16 +563,19 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
         bool drawable = result->pixels != nullptr && effectBitmap->pixels != nullptr;
         Platform::Canvas canvas(drawable ? result->pixels : nullptr, width, height);
         canvas.Clear();
+        // Both images are in word order (the effect picture from the stack,
+        // the boxes by their colour with red and blue swapped): the canvas
+        // treats the three colour bytes alike, so no conversion pass is needed.
+        const uint32_t c = M->backgroundColor;
+        const uint32_t inWordOrder = (c & 0xFF00FF00u) | (c & 0xFFu) << 16 | (c >> 16 & 0xFFu);
         clipToText(canvas);
         int count = M->lineInfo->GetCount();
         for (int i = 0; i < count; ++i) {
             const auto* line = static_cast<const GxLineInfo*>(M->lineInfo->Get(i));
             if (line == nullptr) continue;
             canvas.FillRect(float(line->bounds.left), float(line->bounds.top), float(line->bounds.right),
-                            float(line->bounds.bottom), M->backgroundColor);
+                            float(line->bounds.bottom), inWordOrder);
         }
-        GxBlender::convertBGRAToARGB(result);
-        GxBlender::convertBGRAToARGB(effectBitmap);
         if (drawable) canvas.DrawImage(effectBitmap->pixels, width, height, 0, 0);
         delete M->spareImage;
         M->spareImage = effectBitmap;

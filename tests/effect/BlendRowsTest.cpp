@@ -63,16 +63,24 @@ TEST(BlendRows, EveryKernelGivesTheReferenceBytes) {
     widths.insert(widths.end(), {100, 257, 1031});
 
     for (int n : widths) {
-        for (int round = 0; round < 6; ++round) {
+        for (int round = 0; round < 7; ++round) {
             std::vector<uint8_t> dst32 = bytes.Make(size_t(n) * 4);
             const std::vector<uint8_t> dst8 = bytes.Make(size_t(n));
             std::vector<uint8_t> cov = bytes.Make(size_t(n));
-            // Rounds the kernels take shortcuts on: coverage mostly absent,
-            // pictures of only opaque and clear pixels.
+            // Rounds the kernels take shortcuts on: coverage mostly absent
+            // over pictures mostly of transparent black, pictures of only
+            // opaque and clear pixels (in runs), pictures of only clear ones
+            // under runs of full coverage.
             if (round >= 4)
                 for (size_t i = 0; i < cov.size(); ++i) cov[i] = i % 37 == 36 ? cov[i] : 0;
+            if (round == 4)
+                for (size_t i = 0; i < dst32.size(); ++i) dst32[i] = i / 4 % 37 == 36 ? dst32[i] : 0;
             if (round == 5)
-                for (size_t i = 3; i < dst32.size(); i += 4) dst32[i] = dst32[i] & 1 ? 255 : 0;
+                for (size_t i = 3; i < dst32.size(); i += 4) dst32[i] = i / 4 / 40 % 2 ? 255 : dst32[i] & 1 ? 255 : 0;
+            if (round == 6) {
+                for (size_t i = 3; i < dst32.size(); i += 4) dst32[i] = 0;
+                for (size_t i = 0; i < cov.size(); ++i) cov[i] = i / 40 % 2 ? 255 : cov[i];
+            }
             const std::vector<uint8_t> src32 = bytes.Make(size_t(n) * 4);
             std::vector<uint32_t> words(static_cast<size_t>(n));
             std::memcpy(words.data(), src32.data(), src32.size());

@@ -312,7 +312,7 @@ TEST_F(RenderTest, LinesArePlacedAtTheirBaselines) {
 
 TEST_F(RenderTest, TheClipKeepsThePaddingOnlyOnTheGravitatedSide) {
     Prepare(L"HHHHHHHHHH", 32.0f, 0x00000000u);   // a text alpha of 0 leaves the background alone
-    text.SetBackgroundColor(0xFF00FF00u, true);
+    text.SetBackgroundColor(0xFF20C040u, true);
     AddLine(0, 10, 0, 45, -45, 5, 100);
     HandOverLines();
     GxView* view = text.GetView();
@@ -320,17 +320,26 @@ TEST_F(RenderTest, TheClipKeepsThePaddingOnlyOnTheGravitatedSide) {
 
     view->gravity = GxView::kGravityLeft | GxView::kGravityTop;
     ASSERT_NE(Render(100, 50), nullptr);
-    EXPECT_EQ(At(0, 0), 0xFF00FF00u);
-    EXPECT_EQ(At(89, 39), 0xFF00FF00u);
+    EXPECT_EQ(At(0, 0), 0xFF20C040u);
+    EXPECT_EQ(At(89, 39), 0xFF20C040u);
     EXPECT_EQ(At(90, 20), 0u);
     EXPECT_EQ(At(20, 40), 0u);
 
     view->gravity = GxView::kGravityRight | GxView::kGravityBottom;
     ASSERT_NE(Render(100, 50), nullptr);
-    EXPECT_EQ(At(99, 49), 0xFF00FF00u);
-    EXPECT_EQ(At(10, 10), 0xFF00FF00u);
+    EXPECT_EQ(At(99, 49), 0xFF20C040u);
+    EXPECT_EQ(At(10, 10), 0xFF20C040u);
     EXPECT_EQ(At(9, 20), 0u);
     EXPECT_EQ(At(20, 9), 0u);
+
+    // Opaque text over the box: its own colour and the box's, never either
+    // with red and blue exchanged.
+    text.SetTextColor(0xFFE05010u);
+    ASSERT_NE(Render(100, 50), nullptr);
+    const std::vector<unsigned> all(pixels, pixels + size_t(width) * size_t(height));
+    EXPECT_GT(std::count(all.begin(), all.end(), 0xFFE05010u), 0);
+    EXPECT_GT(std::count(all.begin(), all.end(), 0xFF20C040u), 0);
+    EXPECT_EQ(std::count(all.begin(), all.end(), 0xFF1050E0u) + std::count(all.begin(), all.end(), 0xFF40C020u), 0);
 }
 
 TEST_F(RenderTest, EveryRenderMovesTheBackgroundBoxesAndReplacesThePixels) {

@@ -1,9 +1,12 @@
 // The blur row kernel, once per instruction set (see GxBlurRows.h).
 //
+// The glow's spread and colouring follow at the end.
+//
 // Vector form: 8-bit taps are widened to 16 bits, the two taps of a pair
 // added (at most 510) and multiplied by their weight (at most 128, so the
 // product stays below 2^16), and the products summed in 32-bit lanes, half a
-// vector each. The division is GxDivisor's (x * m) >> s with a 64-bit product:
+// vector each; on x86 two such pairs share one pairwise multiply-add
+// (BlurBlocksPaired). The division is GxDivisor's (x * m) >> s with a 64-bit product:
 // even and odd 32-bit lanes are multiplied apart (MulEven) and put back
 // together. Columns past the last whole vector take the scalar form of the
 // same arithmetic, as does the whole row in the fallback build for x86-64 CPUs
@@ -33,12 +36,102 @@ HWY_INLINE V32 Divide(D32 d32, V32 x, V32 multiplier, int shift) {
 }
 #endif
 
+#if HWY_ARCH_X86 && HWY_TARGET != HWY_SCALAR && HWY_TARGET != HWY_EMU128
+// x86: two taps per multiply. Interleaving the 16-bit samples of taps t and
+// t + 1 puts them side by side in each 32-bit lane, and the pairwise
+// multiply-add (pmaddwd) gives w_t * s_t + w_(t+1) * s_(t+1) for one column
+// per lane: pairs are at most 510 and weights at most 128, so every product
+// and sum stays far inside the signed lanes. The lower and upper interleaves
+// take the columns of each 128-bit block in halves, and the saturating pack
+// at the end (also per block) puts them back in order.
+template <class D16>
+HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n,
+                                const GxGaussian& g, bool inverted, uint8_t* HWY_RESTRICT out) {
+    const int R = g.radius;
+    const int* w = g.weights;
+    const hn::Rebind<uint8_t, D16> d8;
+    const hn::Repartition<int32_t, D16> di32;
+    const hn::Repartition<uint32_t, D16> du32;
+    const hn::Repartition<int16_t, D16> di16;
+    const int N = int(hn::Lanes(d16));
+    const auto multiplier = hn::Set(du32, uint32_t(g.divide.multiplier));
+    const int shift = int(g.divide.shift);
+    const auto full = hn::Set(du32, g.full);
+    const auto most = hn::Set(du32, 255u);
+    // Weights of taps 2k and 2k + 1 as one 32-bit pattern (0 past the last tap).
+    uint32_t pairs[kMaxFilterRadius / 2 + 1];
+    for (int i = 0; i <= R; i += 2) pairs[i / 2] = uint32_t(w[i]) | (i < R ? uint32_t(w[i + 1]) << 16 : 0u);
+    auto pair = [&](const uint8_t* at, ptrdiff_t offset) {
+        return hn::BitCast(di16, hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, at - offset)),
+                                         hn::PromoteTo(d16, hn::LoadU(d8, at + offset))));
+    };
+    auto finish = [&](hn::Vec<decltype(di32)> lo, hn::Vec<decltype(di32)> hi, uint8_t* to) {
+        auto sumLo = hn::BitCast(du32, lo), sumHi = hn::BitCast(du32, hi);
+        if (inverted) {
+            sumLo = hn::Sub(full, sumLo);
+            sumHi = hn::Sub(full, sumHi);
+        }
+        const auto qLo = hn::BitCast(di32, hn::Min(Divide(du32, sumLo, multiplier, shift), most));
+        const auto qHi = hn::BitCast(di32, hn::Min(Divide(du32, sumHi, multiplier, shift), most));
+        hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, to);
+    };
+    using V16 = hn::Vec<decltype(di16)>;
+    using V32 = hn::Vec<decltype(di32)>;
+    auto unused = hn::Zero(di32);
+    auto accumulate = [&](V16 a, V16 b, V16 wv, V32& lo, V32& hi) {
+        lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
+        hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
+    };
+    auto weightsOf = [&](int i) { return hn::BitCast(di16, hn::Set(du32, pairs[i / 2])); };
+    int x = 0;
+    // Two blocks at a time share the weights and the loop.
+    for (; x + 2 * N <= n; x += 2 * N) {
+        const uint8_t* at = c + x;
+        auto lo0 = hn::Zero(di32), hi0 = hn::Zero(di32), lo1 = hn::Zero(di32), hi1 = hn::Zero(di32);
+        const auto first = R >= 1 ? step : 0;
+        const auto w0 = weightsOf(0);
+        accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at))),
+                   R >= 1 ? pair(at, first) : hn::Zero(di16), w0, lo0, hi0);
+        accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at + N))),
+                   R >= 1 ? pair(at + N, first) : hn::Zero(di16), w0, lo1, hi1);
+        int i = 2;
+        for (; i < R; i += 2) {
+            const auto wv = weightsOf(i);
+            const ptrdiff_t o0 = ptrdiff_t(i) * step, o1 = o0 + step;
+            accumulate(pair(at, o0), pair(at, o1), wv, lo0, hi0);
+            accumulate(pair(at + N, o0), pair(at + N, o1), wv, lo1, hi1);
+        }
+        if (i == R) {
+            const auto wv = weightsOf(i);
+            accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), wv, lo0, hi0);
+            accumulate(pair(at + N, ptrdiff_t(R) * step), hn::Zero(di16), wv, lo1, hi1);
+        }
+        finish(lo0, hi0, out + x);
+        finish(lo1, hi1, out + x + N);
+    }
+    for (; x + N <= n; x += N) {
+        const uint8_t* at = c + x;
+        auto lo = hn::Zero(di32), hi = hn::Zero(di32);
+        accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at))), R >= 1 ? pair(at, step) : hn::Zero(di16),
+                   weightsOf(0), lo, hi);
+        int i = 2;
+        for (; i < R; i += 2)
+            accumulate(pair(at, ptrdiff_t(i) * step), pair(at, ptrdiff_t(i + 1) * step), weightsOf(i), lo, hi);
+        if (i == R) accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), weightsOf(i), lo, hi);
+        finish(lo, hi, out + x);
+    }
+    return x;
+}
+#endif
+
 void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted,
              uint8_t* HWY_RESTRICT out) {
     const int R = g.radius;
     const int* w = g.weights;
     int x = 0;
-#if HWY_TARGET != HWY_SCALAR
+#if HWY_ARCH_X86 && HWY_TARGET != HWY_SCALAR && HWY_TARGET != HWY_EMU128
+    x = BlurBlocksPaired(hn::ScalableTag<uint16_t>(), c, step, n, g, inverted, out);
+#elif HWY_TARGET != HWY_SCALAR
     const hn::ScalableTag<uint16_t> d16;
     const hn::Rebind<uint8_t, decltype(d16)> d8;
     const hn::Half<decltype(d16)> dh16;
@@ -112,8 +205,25 @@ void SpreadRow(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT ro
     }
 }
 
+void ShadeRow(const uint8_t* HWY_RESTRICT values, int n, const uint32_t* HWY_RESTRICT table,
+              uint32_t* HWY_RESTRICT out) {
+    int x = 0;
+#if HWY_TARGET != HWY_SCALAR
+    const hn::ScalableTag<int32_t> di32;
+    const hn::Rebind<uint8_t, decltype(di32)> d8;
+    const hn::Rebind<uint32_t, decltype(di32)> du32;
+    const int N = int(hn::Lanes(di32));
+    const auto* words = reinterpret_cast<const int32_t*>(table);
+    for (; x + N <= n; x += N) {
+        const auto index = hn::BitCast(di32, hn::PromoteTo(du32, hn::LoadU(d8, values + x)));
+        hn::StoreU(hn::BitCast(du32, hn::GatherIndex(di32, words, index)), du32, out + x);
+    }
+#endif
+    for (; x < n; ++x) out[x] = table[values[x]];
+}
+
 const Table* GetTable() {
-    static const Table table = {BlurRow, SpreadRow};
+    static const Table table = {BlurRow, SpreadRow, ShadeRow};
     return &table;
 }
 
@@ -137,6 +247,9 @@ void BlurRow(const uint8_t* c, ptrdiff_t step, int n, const GxGaussian& g, bool 
         out[x] = uint8_t(v < 255 ? v : 255);
     }
 }
+void ShadeRow(const uint8_t* values, int n, const uint32_t* table, uint32_t* out) {
+    for (int x = 0; x < n; ++x) out[x] = table[values[x]];
+}
 void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out) {
     for (int x = 1; x + 1 < width; ++x) {
         unsigned s = 0;
@@ -148,7 +261,7 @@ void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, i
 }  // namespace Reference
 
 const Table& ReferenceTable() {
-    static const Table table = {Reference::BlurRow, Reference::SpreadRow};
+    static const Table table = {Reference::BlurRow, Reference::SpreadRow, Reference::ShadeRow};
     return table;
 }
 

@@ -33,15 +33,20 @@ using BlurRow = void (*)(const uint8_t* centre, ptrdiff_t step, int n, const GxG
 using SpreadRow = void (*)(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width,
                            uint8_t* out);
 
+// The glow's colouring: out[x] = table[values[x]] for x in [0, n).
+using ShadeRow = void (*)(const uint8_t* values, int n, const uint32_t* table, uint32_t* out);
+
 struct Table {
     BlurRow blurRow;
     SpreadRow spreadRow;
+    ShadeRow shadeRow;
 };
 
 namespace Reference {
 void BlurRow(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian, bool inverted,
              uint8_t* out);
 void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out);
+void ShadeRow(const uint8_t* values, int n, const uint32_t* table, uint32_t* out);
 }  // namespace Reference
 
 const Table& ReferenceTable();

@@ -1,5 +1,6 @@
 #include "effect/filters/GxGlowLayer.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "effect/GxBlender.h"
@@ -62,37 +63,55 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
     }
 }
 
-// Rows [Rg, H - Rg) of the image, each blurred vertically into a byte row and
-// then horizontally into colour. `frame` fills the columns the horizontal
-// pass cannot reach. `shade[v]` is the premultiplied colour of result v.
-// `row` and `values` are W bytes of scratch.
-void BlurAndColour(const unsigned char* plane, uint32_t* image, const GlowPlan& plan, const GxGaussian& g,
-                   bool inverted, const uint32_t* shade, uint32_t frame, unsigned char* row,
-                   unsigned char* values) {
+// The glow image, one row at a time, drawn destination-over into `dst` with
+// its top-left corner at (left, top) as it is made (each pixel of `dst` takes
+// one image pixel, so the row order changes nothing). Rows [Rg, H - Rg) are
+// blurred vertically into a byte row and then horizontally into colour;
+// `shade[v]` is the premultiplied colour of result v. `row` and `values` are
+// W bytes of scratch, `colours` W words.
+//
+// With a `frame` the image is W x H and the frame fills the rows and columns
+// the passes cannot reach. Without one (a frame of transparent pixels, which
+// destination-over leaves alone) only the part the passes reach is drawn.
+void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const GxGaussian& g, bool inverted,
+                       const uint32_t* shade, const uint32_t* frame, const GxBitmap* dst, int left, int top,
+                       unsigned char* row, unsigned char* values, uint32_t* colours) {
     const int32_t W = plan.width, R = plan.radius;
     const size_t stride = size_t(W);
     const int n = W - 2 * R;
     const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
+    const BlurRows::ShadeRow colour = BlurRows::Active().shadeRow;
+    auto draw = [&](int y, const uint32_t* from, int x, int count) {
+        GxBlender::drawBitmapBlend32(left + x, top + y, dst, from, count, 1, count, GxE_BLEND_DST_OVER);
+    };
+    if (frame != nullptr) {
+        for (int32_t x = 0; x < W; ++x) colours[x] = *frame;
+        for (int32_t y = 0; y < R && y < plan.height; ++y) draw(y, colours, 0, W);
+    }
     // Columns outside [R, W - R) of the byte row are never computed and read
     // as 0 (no coverage): they lie in the frame, 2g from the glyphs. For the
     // inner glow this matters at one place: the box filter's 0 in the plane's
     // first and last column is not blurred back in as "inside".
     std::memset(row, 0, stride);
+    // Rows that land off `dst` are not worked out.
+    const int64_t firstVisible = -int64_t(top), endVisible = int64_t(dst->height) - top;
     for (int32_t y = R; y < plan.height - R; ++y) {
+        if (y < firstVisible || y >= endVisible) continue;
         blur(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R);
         blur(row + R, 1, n, g, inverted, values + R);
-        uint32_t* out = image + size_t(y) * stride;
-        for (int32_t x = 0; x < R; ++x) out[x] = frame;
         // Results never exceed 255, so entry 256 (past the edge colour) is
         // only reached by the rule min(v, 256) on paper.
-        for (int32_t x = R; x < W - R; ++x) out[x] = shade[values[x]];
-        for (int32_t x = W - R; x < W; ++x) out[x] = frame;
+        colour(values + R, n, shade, colours + R);
+        if (frame != nullptr) {
+            draw(y, colours, 0, W);  // the frame columns still hold the frame
+        } else {
+            draw(y, colours + R, R, n);
+        }
     }
+    if (frame == nullptr) return;
+    for (int32_t x = R; x < W - R; ++x) colours[x] = *frame;
     const int32_t firstUnprocessed = plan.height - R > R ? plan.height - R : R;
-    for (int32_t y = 0; y < R && y < plan.height; ++y)
-        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = frame;
-    for (int32_t y = firstUnprocessed; y < plan.height; ++y)
-        for (size_t x = 0; x < stride; ++x) image[size_t(y) * stride + x] = frame;
+    for (int32_t y = firstUnprocessed; y < plan.height; ++y) draw(y, colours, 0, W);
 }
 
 }  // namespace
@@ -102,9 +121,14 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height) 
 }
 
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch) {
+    return GlowBoxFilter(plane, iterations, width, height, scratch, GxRect(0, 0, width, height));
+}
+
+bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch,
+                   const GxRect& content) {
     if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
     const size_t w = size_t(width);
-    // Two rows: the saved row above and the output row.
+    // Two rows for new values on their way back into the plane.
     WorkBuffer<unsigned char> own;
     unsigned char* rows = nullptr;
     if (scratch != nullptr) {
@@ -114,19 +138,36 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
         rows = own.get();
     }
     if (rows == nullptr) return false;
-    unsigned char* saved = rows;
-    unsigned char* out = rows + w;
-    out[0] = 0;
-    out[w - 1] = 0;
     const BlurRows::SpreadRow spread = BlurRows::Active().spreadRow;
-    for (int pass = 0; pass < iterations; ++pass) {
-        // `saved` holds the row above as it was before this pass rewrote it.
-        std::memcpy(saved, plane, w);
-        for (int y = 1; y < height - 1; ++y) {
-            unsigned char* row = plane + size_t(y) * w;
-            if (w >= 3) spread(saved, row, row + w, width, out);
-            std::memcpy(saved, row, w);
-            std::memcpy(row, out, w);
+    // A frame of 255 stays 255 beside the 0 at a row's end (6 x 255 / 4 is
+    // past 255), but not between two such ends: planes that narrow are
+    // rewritten in full.
+    const GxRect all(0, 0, width, height);
+    const GxRect& changing = width >= 4 ? content : all;
+    for (int pass = 1; pass <= iterations; ++pass) {
+        // What pass p can change: the content grown by p, inside the rows
+        // and columns a pass rewrites.
+        const int top = std::max(1, changing.top - pass), bottom = std::min(height - 1, changing.bottom + pass);
+        const int left = std::max(1, changing.left - pass), right = std::min(width - 1, changing.right + pass);
+        if (top < bottom && left < right) {
+            const size_t span = size_t(right - left);
+            // Each new row waits in one of two buffers until the row below
+            // it has been worked out, which reads it as it was.
+            for (int y = top; y < bottom; ++y) {
+                unsigned char* row = plane + size_t(y) * w;
+                unsigned char* out = rows + size_t(y & 1) * w;
+                spread(row - w + left - 1, row + left - 1, row + w + left - 1, int(span) + 2, out + left - 1);
+                if (y > top) std::memcpy(row - w + left, rows + size_t((y - 1) & 1) * w + left, span);
+            }
+            std::memcpy(plane + size_t(bottom - 1) * w + left, rows + size_t((bottom - 1) & 1) * w + left, span);
+        }
+        // Every pass writes 0 at both ends of the rows it rewrites; the
+        // first pass reads the ends as they were.
+        if (pass == 1) {
+            for (int y = 1; y < height - 1; ++y) {
+                plane[size_t(y) * w] = 0;
+                plane[size_t(y) * w + w - 1] = 0;
+            }
         }
     }
     return true;
@@ -203,20 +244,20 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     if (!PlanGaussian(&gaussian, plan.radius, kGlowGaussianCentre, GaussianRounding::kDouble)) return;
     // Work memory: the stack's when it lends it, else our own for this call.
     GxScratch* scratch = p->scratch;
-    WorkBuffer<uint32_t> ownImage;
+    WorkBuffer<uint32_t> ownColours;
     WorkBuffer<unsigned char> ownPlane, ownRows;
-    uint32_t* image = nullptr;
+    uint32_t* colours = nullptr;
     unsigned char* plane = nullptr;
     if (scratch != nullptr) {
-        image = scratch->get<uint32_t>(GxScratch::kPlaneA, plan.pixels);
+        colours = scratch->get<uint32_t>(GxScratch::kPlaneA, size_t(plan.width));
         plane = scratch->get<unsigned char>(GxScratch::kPlaneB, plan.pixels);
     } else {
-        ownImage = AllocateWork<uint32_t>(plan.pixels);
+        ownColours = AllocateWork<uint32_t>(size_t(plan.width));
         ownPlane = AllocateWork<unsigned char>(plan.pixels);
-        image = ownImage.get();
+        colours = ownColours.get();
         plane = ownPlane.get();
     }
-    if (image == nullptr || plane == nullptr) return;
+    if (colours == nullptr || plane == nullptr) return;
 
     uint32_t table[kColorTableSize];
     makeColorLUT(table, 0.3f, kRampLinear);
@@ -225,7 +266,11 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     for (int v = 0; v < kColorTableSize; ++v) shade[v] = PremultiplyColor(table[256 - v]);
 
     FillPlane(plane, plan, *p->src, box, inverted);
-    if (!GlowBoxFilter(plane, plan.iterations, plan.width, plan.height, scratch)) return;
+    // Outside the glyph box the plane holds only its frame value, which a
+    // pass leaves as it is (but for the rows' end bytes).
+    const int32_t inset = 2 * plan.g;
+    const GxRect content(inset, inset, inset + (box.right - box.left), inset + (box.bottom - box.top));
+    if (!GlowBoxFilter(plane, plan.iterations, plan.width, plan.height, scratch, content)) return;
 
     // The box filter is done with the row buffers.
     unsigned char* rows = nullptr;
@@ -236,11 +281,11 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
         rows = ownRows.get();
     }
     if (rows == nullptr) return;
-    BlurAndColour(plane, image, plan, gaussian, inverted, shade, inverted ? 0xFFFFFFFFu : 0u, rows,
-                  rows + plan.width);
-
-    GxBlender::drawBitmapBlend32(box.left - 2 * plan.g, box.top - 2 * plan.g, p->dst, image,
-                                 plan.width, plan.height, plan.width, GxE_BLEND_DST_OVER);
+    // The inner glow's frame is opaque white; the outer glow's is
+    // transparent, so only the part the passes reach is drawn.
+    const uint32_t white = 0xFFFFFFFFu;
+    BlurColourAndDraw(plane, plan, gaussian, inverted, shade, inverted ? &white : nullptr, p->dst,
+                      box.left - 2 * plan.g, box.top - 2 * plan.g, rows, rows + plan.width, colours);
 }
 
 }  // namespace Glimmer

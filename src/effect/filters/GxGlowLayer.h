@@ -48,6 +48,7 @@
 #include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
 #include "effect/GxScratch.h"
+#include "foundation/GxRect.h"
 
 namespace Glimmer {
 
@@ -84,6 +85,10 @@ protected:
 // its row buffers cannot be allocated. With `scratch` its rows come from there.
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height);
 bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch);
+// The same, knowing that outside `content` every byte is 0 or every byte is
+// 255 (a pass keeps either): pass p only rewrites the content grown by p.
+bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, GxScratch* scratch,
+                   const GxRect& content);
 
 // The glow colour table for a record: single colour, first stop, or ramp from
 // 0; then the fade. Null `property` or a size of exactly 0: all transparent.

@@ -37,10 +37,35 @@
 // its centre cell: glyph interiors cost O(1) a pixel and full stamps run
 // along the edges. The rule ("no weaker one step nearer the centre") is
 // checked on the kernel at hand first, so any kernel gives the result of
-// plain stamping.
+// plain stamping. The band functions below work this way.
+//
+// The layer gets the same bytes the other way round, per output pixel, by
+// chords (StrokeChords). Every row of a disc kernel is symmetric and never
+// grows away from its centre column, so it is the maximum of nested centred
+// runs, one per coverage level t it holds: t on columns |dx| <= w. A kernel
+// row's best proposal at an output pixel is then the maximum over its levels
+// of (largest source sample on the run) + t - 255, floored at 0: pairing an
+// inner sample with an outer, weaker level proposes less than that sample
+// really does, so it never wins. The largest sample on a run of 2w + 1 is the
+// larger of two spans of 2^j samples (2^j <= 2w + 1 < 2^(j+1)) that cover it
+// exactly, read from tables of span maxima built once per drawing; a term
+// (kernel row, level) thus costs two reads a pixel whatever its length, and
+// a whole block of pixels goes through it at once (GxStrokeRows). The full
+// levels (t = 255, the disc's inside) come first, centre row outward, and a
+// block that they fill to 255 is finished without the rim levels. Blocks
+// inside the stroke mostly fill up after a few terms; blocks that stay
+// below 255 (along the stroke's outer edge and beyond it) read all D full
+// terms and every rim term, so there the cost still grows with the radius.
+// Only the part of the output that lands on a target is worked out.
+//
+// Every disc makeCircleKernel makes has that shape: distances only grow
+// along a row, the float steps that turn them into bytes never reverse an
+// order, and the odd centre is 255 from r = 1 on and, below that, equal to
+// its row neighbours (r - 1 + 1 is exactly r) or alone (D = 1).
 
 #include "effect/filters/GxStroke.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
@@ -49,6 +74,7 @@
 #include "effect/GxBlender.h"
 #include "effect/filters/GxFilterLimits.h"
 #include "effect/filters/GxLayerSupport.h"
+#include "effect/filters/GxStrokeRows.h"
 
 namespace Glimmer {
 
@@ -215,6 +241,207 @@ void* GxStroke::partalDTStrokeInside(void* arg) {
     return nullptr;
 }
 
+// --- chords
+
+bool StrokeChords::plan(const unsigned char* k, int D) {
+    D_ = 0;
+    if (k == nullptr || D <= 0 || (D & 1) == 0 || D > kMaxKernelSize) return false;
+    const int R = D >> 1;
+    try {
+        levels_.clear();
+        rows_.assign(size_t(D), Row());
+        order_.clear();
+        int widest = 0;
+        for (int ky = 0; ky < D; ++ky) {
+            const unsigned char* row = k + size_t(ky) * D + R;  // the centre column
+            for (int d = 1; d <= R; ++d)
+                if (row[d] != row[-d] || row[d] > row[d - 1]) return false;
+            rows_[size_t(ky)].first = int(levels_.size());
+            for (int d = 0; d <= R && row[d] != 0; ++d) {
+                if (d < R && row[d + 1] == row[d]) continue;  // the run goes on
+                int span = 0;
+                while ((2 << span) <= 2 * d + 1) ++span;
+                levels_.push_back(Level{-d, d - (1 << span) + 1, span, uint8_t(255 - row[d])});
+                widest = d > widest ? d : widest;
+            }
+            rows_[size_t(ky)].count = int(levels_.size()) - rows_[size_t(ky)].first;
+        }
+        order_.push_back(R);
+        for (int step = 1; step <= R; ++step) {
+            order_.push_back(R - step);
+            order_.push_back(R + step);
+        }
+        widest_ = widest;
+        spans_ = 1;
+        while ((2 << (spans_ - 1)) <= 2 * widest + 1) ++spans_;
+    } catch (...) {
+        return false;
+    }
+    R_ = R;
+    D_ = D;
+    return true;
+}
+
+namespace {
+
+// Geometry of one spread: the framed source, and its rows inside the span
+// tables with `reach` zeros on either side (every run of every output column
+// stays inside them).
+struct SpreadGeometry {
+    int width, height;  // the framed source
+    int reach;          // R + widest
+    size_t pitch;       // bytes per span table row
+    size_t table;       // bytes per span table
+    size_t terms;       // bytes of the term list, a multiple of 64
+};
+
+bool Geometry(int w, int h, int frame, int R, int widest, int spans, size_t levels, SpreadGeometry* g) {
+    if (w <= 0 || h <= 0 || frame < 0) return false;
+    const int64_t width = int64_t(w) + 2 * int64_t(frame);
+    const int64_t height = int64_t(h) + 2 * int64_t(frame);
+    const int64_t pitch = width + 2 * (int64_t(R) + widest);
+    size_t table = 0, all = 0;
+    if (pitch > INT32_MAX || height > INT32_MAX ||
+        !GxBitmap::PixelBytes(unsigned(pitch), unsigned(height), 1, &table) ||
+        !GxBitmap::PixelBytes(unsigned(pitch), unsigned(height), unsigned(spans), &all))
+        return false;
+    g->width = int(width);
+    g->height = int(height);
+    g->reach = R + widest;
+    g->pitch = size_t(pitch);
+    g->table = table;
+    g->terms = (levels * sizeof(StrokeRows::Term) + 63) / 64 * 64;
+    return true;
+}
+
+// The part of a w x h plane placed at (x, y) that lands on `dst` or on
+// `extra` (when given): the bounding box of both, in plane coordinates.
+bool VisiblePart(int x, int y, int w, int h, const GxBitmap* dst, const GxBitmap* extra,
+                 StrokeChords::Window* window) {
+    int64_t left = INT64_MAX, top = INT64_MAX, right = INT64_MIN, bottom = INT64_MIN;
+    for (const GxBitmap* target : {dst, extra}) {
+        if (target == nullptr || target->pixels == nullptr) continue;
+        const int64_t l = std::max<int64_t>(0, -int64_t(x)), t = std::max<int64_t>(0, -int64_t(y));
+        const int64_t r = std::min<int64_t>(w, int64_t(target->width) - x);
+        const int64_t b = std::min<int64_t>(h, int64_t(target->height) - y);
+        if (l >= r || t >= b) continue;
+        left = std::min(left, l);
+        top = std::min(top, t);
+        right = std::max(right, r);
+        bottom = std::max(bottom, b);
+    }
+    if (left >= right || top >= bottom) return false;
+    *window = StrokeChords::Window{int(left), int(top), int(right - left), int(bottom - top)};
+    return true;
+}
+
+}  // namespace
+
+bool StrokeChords::workBytes(int w, int h, int frame, size_t* bytes) const {
+    SpreadGeometry g;
+    if (!planned() || !Geometry(w, h, frame, R_, widest_, spans_, levels_.size(), &g)) return false;
+    *bytes = g.terms + g.table * size_t(spans_);
+    return true;
+}
+
+void StrokeChords::spread(const unsigned char* source, int stride, int w, int h, int frame, bool inverse,
+                          unsigned char* work, const Window& window, unsigned char* out, size_t outStride) const {
+    SpreadGeometry g;
+    if (!planned() || source == nullptr || work == nullptr || out == nullptr ||
+        !Geometry(w, h, frame, R_, widest_, spans_, levels_.size(), &g))
+        return;
+    const int outWidth = g.width + D_ - 1, outHeight = g.height + D_ - 1;
+    if (window.left < 0 || window.top < 0 || window.width <= 0 || window.height <= 0 ||
+        window.left > outWidth - window.width || window.top > outHeight - window.height)
+        return;
+    const StrokeRows::Table& rows = StrokeRows::Active();
+    auto* terms = reinterpret_cast<StrokeRows::Term*>(work);
+    unsigned char* tables = work + g.terms;
+
+    // The source rows the window reads.
+    const int firstRow = window.top - (D_ - 1) > 0 ? window.top - (D_ - 1) : 0;
+    const int endRow = window.top + window.height < g.height ? window.top + window.height : g.height;
+
+    // Span table 0: the framed source (or its inverse) between zeros.
+    const unsigned char frameValue = inverse ? 255 : 0;
+    for (int y = firstRow; y < endRow; ++y) {
+        unsigned char* row = tables + size_t(y) * g.pitch;
+        std::memset(row, 0, size_t(g.reach));
+        unsigned char* framed = row + g.reach;
+        const int sy = y - frame;
+        if (sy < 0 || sy >= h) {
+            std::memset(framed, frameValue, size_t(g.width));
+        } else {
+            std::memset(framed, frameValue, size_t(frame));
+            const unsigned char* from = source + size_t(sy) * size_t(stride);
+            unsigned char* to = framed + frame;
+            if (inverse) {
+                for (int x = 0; x < w; ++x) to[x] = uint8_t(255 - from[x]);
+            } else {
+                std::memcpy(to, from, size_t(w));
+            }
+            std::memset(to + w, frameValue, size_t(frame));
+        }
+        std::memset(framed + g.width, 0, size_t(g.reach));
+    }
+    // Table j from table j - 1: the larger of two neighbouring spans. Runs
+    // only read spans that end inside the row.
+    for (int j = 1; j < spans_; ++j) {
+        const unsigned char* below = tables + size_t(j - 1) * g.table;
+        unsigned char* table = tables + size_t(j) * g.table;
+        const int n = int(g.pitch) - (1 << j) + 1;
+        for (int y = firstRow; y < endRow; ++y) {
+            const size_t at = size_t(y) * g.pitch;
+            rows.maxRow(below + at, below + at + (1 << (j - 1)), n, table + at);
+        }
+    }
+
+    // One output row at a time: the full levels of the kernel rows that
+    // reach a source row, centre first, then every rim level. Output column
+    // `window.left` centres on source column window.left - R.
+    const unsigned char* spanBase[32];
+    for (int j = 0; j < spans_; ++j)
+        spanBase[j] = tables + size_t(j) * g.table + size_t(g.reach - R_ + window.left);
+    auto term = [&](const Level& level, int sy) {
+        const unsigned char* centre = spanBase[level.span] + size_t(sy) * g.pitch;
+        return StrokeRows::Term{centre + level.left, centre + level.right, level.cut};
+    };
+    for (int y = window.top; y < window.top + window.height; ++y) {
+        // Kernel rows ky reach source row y - ky.
+        const int kyFirst = y - (g.height - 1) > 0 ? y - (g.height - 1) : 0;
+        const int kyEnd = y + 1 < D_ ? y + 1 : D_;
+        int flat = 0;
+        for (int ky : order_) {
+            const Row& r = rows_[size_t(ky)];
+            if (ky < kyFirst || ky >= kyEnd || r.count == 0 || levels_[size_t(r.first)].cut != 0) continue;
+            terms[flat++] = term(levels_[size_t(r.first)], y - ky);
+        }
+        int count = flat;
+        for (int ky = kyFirst; ky < kyEnd; ++ky) {
+            const Row& r = rows_[size_t(ky)];
+            for (int i = 0; i < r.count; ++i) {
+                const Level& level = levels_[size_t(r.first + i)];
+                if (level.cut != 0) terms[count++] = term(level, y - ky);
+            }
+        }
+        rows.dilateRow(terms, flat, count, window.width, out + size_t(y - window.top) * outStride);
+    }
+}
+
+// --- the layer
+
+bool GxStroke::prepare(float radius) {
+    if (prepared && radius == plannedRadius) return chords.planned();
+    prepared = false;
+    unsigned char* raw = nullptr;
+    const int D = makeCircleKernel(&raw, radius);
+    WorkBuffer<unsigned char> kernel(raw);
+    if (!kernel || !chords.plan(kernel.get(), D)) return false;
+    plannedRadius = radius;
+    prepared = true;
+    return true;
+}
+
 GxStroke::GxStroke() { style = GxECore::kStroke; }
 
 GxStroke::~GxStroke() { delete property; }
@@ -255,83 +482,63 @@ void GxStroke::doPostProcessing(GxECore::ParamPostProcessing* p) {
 
     const int position = property->position;
     const float radius = position != 0 ? property->size : property->size * 0.5f;
-    unsigned char* rawKernel = nullptr;
-    const int D = makeCircleKernel(&rawKernel, radius);
-    WorkBuffer<unsigned char> kernel(rawKernel);
-    if (!kernel) return;
-    const int R = D >> 1;
+    // Every disc makeCircleKernel makes is chords; the check is a guard.
+    if (!prepare(radius)) return;
+    const int R = chords.kernelSize() >> 1;
 
-    // Text rectangle inside a one-pixel frame of zeros.
-    const int64_t paddedW = int64_t(rect.right) - rect.left + 2;
-    const int64_t paddedH = int64_t(rect.bottom) - rect.top + 2;
-    size_t paddedBytes = 0;
-    if (paddedW > INT32_MAX || paddedH > INT32_MAX ||
-        !GxBitmap::PixelBytes(unsigned(paddedW), unsigned(paddedH), 1, &paddedBytes))
-        return;
-    const int W = int(paddedW);
-    const int H = int(paddedH);
-    WorkBuffer<unsigned char> padded = AllocateWork<unsigned char>(paddedBytes);
-    if (!padded) return;
-    unsigned char* pad = padded.get();
-    std::memset(pad, 0, size_t(W));
-    for (int i = 1; i <= H - 2; ++i) {
-        unsigned char* row = pad + size_t(i) * W;
-        row[0] = 0;
-        std::memcpy(row + 1, src.pixels + size_t(rect.top + i - 1) * src.width + rect.left,
-                    size_t(W - 2));
-        row[W - 1] = 0;
-    }
-    std::memset(pad + size_t(H - 1) * W, 0, size_t(W));
-
-    // Output: the padded plane grown by R on every side (two planes in centre mode).
-    const int64_t Wo = int64_t(W) + 2 * R;
-    const int64_t Ho = int64_t(H) + 2 * R;
+    // The text rectangle inside a one-pixel frame of zeros; the output is
+    // that grown by R on every side (two planes in centre mode).
+    const int textW = rect.right - rect.left, textH = rect.bottom - rect.top;
+    const int64_t Wo = int64_t(textW) + 2 + 2 * R;
+    const int64_t Ho = int64_t(textH) + 2 + 2 * R;
     const unsigned planes = position == 0 ? 2 : 1;
     size_t outBytes = 0;
     if (Wo > INT32_MAX || Ho > INT32_MAX ||
         !GxBitmap::PixelBytes(unsigned(Wo), unsigned(Ho), planes, &outBytes))
         return;
-    WorkBuffer<unsigned char> output = AllocateWork<unsigned char>(outBytes, true);
-    if (!output) return;
-    const int planeSize = int(Wo * Ho);
+    const size_t planeSize = size_t(Wo) * size_t(Ho);
 
-    StrokeJob job;
-    job.outPlanes = output.get();
-    job.paddedMask = pad;
-    job.kernel = kernel.get();
-    job.srcStride = W;
-    job.srcHeight = H;
-    job.srcTop = 0;
-    job.srcLeft = 0;
-    job.dstStride = int(Wo);
-    job.dstHeight = int(Ho);
-    job.dstTop = R;
-    job.dstLeft = R;
-    job.planeSize = planeSize;
-    job.radius = static_cast<int32_t>(radius);
-    job.kernelSize = D;
-    job.width = W;
-    job.height = H;
-    job.rowBegin = 0;
-    job.rowEnd = H;
-    if (position == 0) {
-        partalDTStrokeCenter(&job);
-        unsigned char* band = output.get();
-        const unsigned char* inverse = band + planeSize;
-        for (int i = 0; i < planeSize; ++i) band[i] = band[i] < inverse[i] ? band[i] : inverse[i];
-    } else if (position == 1) {
-        partalDTStrokeOutside(&job);
+    size_t workBytes = 0;
+    if (!chords.workBytes(textW, textH, 1, &workBytes)) return;
+    // Work memory: the stack's when it lends it, else our own for this call.
+    WorkBuffer<unsigned char> ownOutput, ownWork;
+    unsigned char* output = nullptr;
+    unsigned char* work = nullptr;
+    if (p->scratch != nullptr) {
+        output = p->scratch->get<unsigned char>(GxScratch::kPlaneB, outBytes);
+        work = p->scratch->get<unsigned char>(GxScratch::kPlaneA, workBytes);
     } else {
-        partalDTStrokeInside(&job);
+        ownOutput = AllocateWork<unsigned char>(outBytes);
+        ownWork = AllocateWork<unsigned char>(workBytes);
+        output = ownOutput.get();
+        work = ownWork.get();
+    }
+    if (output == nullptr || work == nullptr) return;
+    // Only what lands on a target is worked out.
+    const int x = rect.left - 1 - R;
+    const int y = rect.top - 1 - R;
+    StrokeChords::Window window;
+    if (!VisiblePart(x, y, int(Wo), int(Ho), p->dst, p->extraDst, &window)) return;
+    const unsigned char* corner = src.pixels + size_t(rect.top) * src.width + size_t(rect.left);
+    const int stride = int(src.width);
+    unsigned char* visible = output + size_t(window.top) * size_t(Wo) + size_t(window.left);
+    chords.spread(corner, stride, textW, textH, 1, position != 0 && position != 1, work, window, visible,
+                  size_t(Wo));
+    if (position == 0) {
+        unsigned char* inverse = visible + planeSize;
+        chords.spread(corner, stride, textW, textH, 1, true, work, window, inverse, size_t(Wo));
+        const StrokeRows::MinRow band = StrokeRows::Active().minRow;
+        for (int row = 0; row < window.height; ++row)
+            band(visible + size_t(row) * size_t(Wo), inverse + size_t(row) * size_t(Wo), window.width);
     }
 
     const int mode = (p->separateWorkImage == 1 || position != 0) ? GxE_BLEND_DST_OVER : GxE_BLEND_SRC_OVER;
-    const int x = rect.left - 1 - R;
-    const int y = rect.top - 1 - R;
-    GxBlender::drawBitmapBlend8(x, y, p->dst, output.get(), int(Wo), int(Ho), int(Wo), property->color, mode);
+    const int left = x + window.left, top = y + window.top;
+    GxBlender::drawBitmapBlend8(left, top, p->dst, visible, window.width, window.height, int(Wo), property->color,
+                                mode);
     if (p->extraDst != nullptr)
-        GxBlender::drawBitmapBlend8(x, y, p->extraDst, output.get(), int(Wo), int(Ho), int(Wo), property->color,
-                                    mode);
+        GxBlender::drawBitmapBlend8(left, top, p->extraDst, visible, window.width, window.height, int(Wo),
+                                    property->color, mode);
 }
 
 }  // namespace Glimmer

@@ -3,7 +3,9 @@
 // wholly outside them or wholly inside them. See GxStroke.cpp for how the
 // band is grown.
 
+#include <cstddef>
 #include <cstdint>
+#include <vector>
 
 #include "effect/GxECoreBase.h"
 #include "effect/GxProperty.h"
@@ -44,6 +46,55 @@ struct StrokeJob {
 // leaves `*out` alone too.
 int makeCircleKernel(unsigned char** out, float radius);
 
+// A disc kernel planned as chords (see GxStroke.cpp): each kernel row as
+// nested centred runs, one per coverage level. The dilation it computes is
+// byte for byte what stamping the kernel at every source pixel gives.
+class StrokeChords {
+public:
+    // False (nothing planned) when a row of the D x D kernel is not
+    // symmetric and non-increasing away from its centre column: such a
+    // kernel is only stamped.
+    bool plan(const unsigned char* kernel, int D);
+    bool planned() const { return D_ > 0; }
+    int kernelSize() const { return D_; }
+
+    // Work memory spread() needs for a w x h source with a frame of `frame`
+    // pixels; false when it does not fit the filters' limits.
+    bool workBytes(int w, int h, int frame, size_t* bytes) const;
+    // Part of the output plane: columns [left, left + width), rows [top, top + height).
+    struct Window {
+        int left, top, width, height;
+    };
+    // The dilation of the w x h source (rows `stride` bytes apart) inside a
+    // frame of zeros `frame` pixels wide, or of that framed source's inverse.
+    // Its plane is (w + 2 frame + D - 1) x (h + 2 frame + D - 1); the bytes of
+    // `window` (which must lie on it) are written to `out`, rows `outStride`
+    // apart. Samples outside the frame count as nothing.
+    void spread(const unsigned char* source, int stride, int w, int h, int frame, bool inverse,
+                unsigned char* work, const Window& window, unsigned char* out, size_t outStride) const;
+
+private:
+    // A run of columns centre - w .. centre + w, the larger of the spans of
+    // 2^span samples from centre + left and from centre + right.
+    struct Level {
+        int left;     // -w
+        int right;    // w - 2^span + 1
+        int span;
+        uint8_t cut;  // 255 - its coverage
+    };
+    struct Row {
+        int first = 0;  // its levels, narrowest (strongest) first
+        int count = 0;
+    };
+    int D_ = 0;
+    int R_ = 0;
+    int widest_ = 0;  // widest run of any level
+    int spans_ = 0;   // span tables: 2^0 .. 2^(spans_ - 1)
+    std::vector<Level> levels_;
+    std::vector<Row> rows_;
+    std::vector<int> order_;  // kernel rows, centre first, then outward
+};
+
 class GxStroke : public GxECoreBase {
 public:
     GxStroke();
@@ -71,7 +122,14 @@ public:
     static void* partalDTStrokeInside(void* job);
 
 private:
+    // Plans the disc of `radius` unless it is the one planned last; false
+    // when there is none.
+    bool prepare(float radius);
+
     GxStrokeProperty* property = nullptr;
+    bool prepared = false;
+    float plannedRadius = 0.0f;
+    StrokeChords chords;
 };
 
 }  // namespace Glimmer

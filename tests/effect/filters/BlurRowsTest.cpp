@@ -129,5 +129,28 @@ TEST(BlurRows, EverySpreadKernelGivesTheReferenceBytes) {
     }
 }
 
+// The glow's colouring beside its reference: random values and table, every
+// width from 1 to 64 and some long ones, outputs poisoned.
+TEST(BlurRows, EveryShadeKernelGivesTheReferenceWords) {
+    std::mt19937 random(13);
+    std::vector<uint32_t> table(257);
+    for (auto& w : table) w = random();
+    std::vector<int> widths;
+    for (int n = 1; n <= 64; ++n) widths.push_back(n);
+    widths.insert(widths.end(), {200, 1031});
+    for (int n : widths) {
+        std::vector<uint8_t> values(static_cast<size_t>(n));
+        for (auto& v : values) v = uint8_t(random());
+        std::vector<uint32_t> expected(static_cast<size_t>(n) + 4, 0xDEADBEEFu);
+        const std::vector<uint32_t> poison = expected;
+        BlurRows::Reference::ShadeRow(values.data(), n, table.data(), expected.data());
+        for (const auto& v : BlurRows::Variants()) {
+            std::vector<uint32_t> got = poison;
+            v.table->shadeRow(values.data(), n, table.data(), got.data());
+            ASSERT_EQ(got, expected) << v.name << " width " << n;
+        }
+    }
+}
+
 }  // namespace
 }  // namespace Glimmer

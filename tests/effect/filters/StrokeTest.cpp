@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "effect/filters/GxStroke.h"
+#include "effect/filters/GxStrokeRows.h"
 #include "effect/filters/LayerHarness.h"
 
 namespace Glimmer {
@@ -61,7 +62,7 @@ void ReferenceSpread(const std::vector<uint8_t>& pad, int W, int H, const unsign
     }
 }
 
-TEST(StrokeBands, AgreeWithPlainStampingWholeOrInBands) {
+TEST(StrokeBands, BandsAndChordsAgreeWithPlainStamping) {
     // Text-like padded masks: solid blocks, plateaus of one mid value (ties
     // decide which pixels may skip their stamp), specks, a zero frame.
     std::mt19937 rng(1234);
@@ -82,18 +83,57 @@ TEST(StrokeBands, AgreeWithPlainStampingWholeOrInBands) {
     using Band = void* (*)(void*);
     const Band bands[] = {GxStroke::partalDTStrokeOutside, GxStroke::partalDTStrokeInside,
                           GxStroke::partalDTStrokeCenter};
-    for (float r : {-1.0f, 0.3f, 0.5f, 0.8f, 1.0f, 1.7f, 3.6f}) {
+    // The chords (what the layer runs) must agree too: fractional radii,
+    // radii below 1, runs cut off by the kernel's square, masks smaller than
+    // the disc.
+    for (float r : {-1.0f, 0.3f, 0.5f, 0.8f, 1.0f, 1.7f, 3.6f, 4.3f, 6.5f, 11.2f}) {
         Kernel disc(r);
         unsigned char* k = r < 0 ? ring : disc.bytes;
         const int D = r < 0 ? 3 : disc.size, R = D >> 1;
+        StrokeChords chords;
+        const bool planned = chords.plan(k, D);
+        EXPECT_EQ(planned, r >= 0) << r;  // every disc is chords, the ring is not
         for (int trial = 0; trial < 5; ++trial) {
-            const int W = 8 + int(rng() % 20), H = 6 + int(rng() % 12);
+            const int W = 3 + int(rng() % 25), H = 3 + int(rng() % 15);
             std::vector<uint8_t> pad = randomMask(W, H);
             const int P = (W + 2 * R) * (H + 2 * R);
             for (int mode = 0; mode < 3; ++mode) {
                 std::vector<uint8_t> want(size_t(2) * P, 0);
                 ReferenceSpread(pad, W, H, k, D, mode == 1, want.data());
                 if (mode == 2) ReferenceSpread(pad, W, H, k, D, true, want.data() + P);
+                if (planned) {
+                    // The zero frame given, or (odd trials) added by the spread.
+                    const int frame = trial % 2;
+                    const uint8_t* inner = pad.data() + frame * (W + 1);
+                    size_t bytes = 0;
+                    ASSERT_TRUE(chords.workBytes(W - 2 * frame, H - 2 * frame, frame, &bytes));
+                    // The whole plane, or (trial 2) a part of it; every byte of it is written.
+                    const int Wo = W + 2 * R, Ho = H + 2 * R;
+                    StrokeChords::Window window{0, 0, Wo, Ho};
+                    std::vector<uint8_t> expect = want;
+                    if (trial == 2) {
+                        window.left = int(rng() % unsigned(Wo));
+                        window.top = int(rng() % unsigned(Ho));
+                        window.width = 1 + int(rng() % unsigned(Wo - window.left));
+                        window.height = 1 + int(rng() % unsigned(Ho - window.top));
+                        for (int plane = 0; plane < 2; ++plane)
+                            for (int y = 0; y < Ho; ++y)
+                                for (int x = 0; x < Wo; ++x)
+                                    if (x < window.left || x >= window.left + window.width || y < window.top ||
+                                        y >= window.top + window.height)
+                                        expect[size_t(plane) * P + size_t(y) * Wo + x] = 77;
+                    }
+                    std::vector<uint8_t> work(bytes), got(size_t(2) * P, 0);
+                    std::fill(got.begin(), got.begin() + (mode == 2 ? 2 : 1) * P, 77);
+                    if (mode != 2) std::fill(expect.begin() + P, expect.end(), 0);
+                    auto spread = [&](bool inverse, uint8_t* out) {
+                        chords.spread(inner, W, W - 2 * frame, H - 2 * frame, frame, inverse, work.data(), window,
+                                      out + size_t(window.top) * Wo + window.left, size_t(Wo));
+                    };
+                    spread(mode == 1, got.data());
+                    if (mode == 2) spread(true, got.data() + P);
+                    ASSERT_EQ(got, expect) << "chords r=" << r << " mode=" << mode << " " << W << "x" << H;
+                }
                 for (int pieces : {1, 3}) {
                     std::vector<uint8_t> got(size_t(2) * P, 0);
                     for (int b = 0; b < pieces; ++b) {
@@ -112,6 +152,54 @@ TEST(StrokeBands, AgreeWithPlainStampingWholeOrInBands) {
     StrokeJob job{plane.data(), full.data(), two.bytes, 5, 5, 0, 0, 9, 9, 2, 2, 81, 2, 5, 5, 5, 0, 5};
     GxStroke::partalDTStrokeInside(&job);
     EXPECT_EQ(plane, std::vector<uint8_t>(81, 0));
+}
+
+// Every compiled row kernel beside the reference: random span rows of
+// mostly 0 and 255, random terms (some full, some cut), every width from 1
+// to 64 and some long ones, outputs poisoned with random bytes.
+TEST(StrokeRows, EveryKernelGivesTheReferenceBytes) {
+    std::mt19937 rng(99);
+    auto bytes = [&](size_t n) {
+        std::vector<uint8_t> v(n);
+        for (auto& b : v) b = rng() % 3 == 0 ? uint8_t(rng()) : rng() % 2 ? 255 : 0;
+        return v;
+    };
+    const auto variants = StrokeRows::Variants();
+    ASSERT_FALSE(variants.empty());
+    std::vector<int> widths;
+    for (int n = 1; n <= 64; ++n) widths.push_back(n);
+    widths.insert(widths.end(), {100, 257, 1031});
+    for (int n : widths) {
+        const std::vector<uint8_t> a = bytes(size_t(n) + 40), b = bytes(size_t(n) + 40);
+        for (int round = 0; round < 4; ++round) {
+            // Round 0 has no full terms, round 3 a full 255 source (blocks stop early).
+            std::vector<StrokeRows::Term> terms;
+            const int flat = round == 0 ? 0 : int(rng() % 6);
+            const int count = flat + int(rng() % 8);
+            for (int i = 0; i < count; ++i) {
+                const std::vector<uint8_t>& from = i % 2 ? a : b;
+                terms.push_back({from.data() + rng() % 40, from.data() + rng() % 40,
+                                 uint8_t(i < flat ? 0 : rng() % 256)});
+            }
+            std::vector<uint8_t> full(size_t(n) + 40, 255);
+            if (round == 3 && flat > 0) terms[0].a = full.data();
+            std::vector<uint8_t> want = bytes(size_t(n));
+            const std::vector<uint8_t> poison = want;
+            StrokeRows::Reference::DilateRow(terms.data(), flat, count, n, want.data());
+            std::vector<uint8_t> wantMax = poison, wantMin = poison;
+            StrokeRows::Reference::MaxRow(a.data(), b.data() + 3, n, wantMax.data());
+            StrokeRows::Reference::MinRow(wantMin.data(), a.data(), n);
+            for (const auto& v : variants) {
+                std::vector<uint8_t> got = poison, gotMax = poison, gotMin = poison;
+                v.table->dilateRow(terms.data(), flat, count, n, got.data());
+                v.table->maxRow(a.data(), b.data() + 3, n, gotMax.data());
+                v.table->minRow(gotMin.data(), a.data(), n);
+                ASSERT_EQ(got, want) << v.name << " width " << n << " round " << round;
+                ASSERT_EQ(gotMax, wantMax) << v.name << " width " << n;
+                ASSERT_EQ(gotMin, wantMin) << v.name << " width " << n;
+            }
+        }
+    }
 }
 
 TEST(StrokeLayer, MarginsAndSizeZero) {
