@@ -24,12 +24,13 @@
 // reference's order of precedence. The one product that can pass 16 bits (the
 // text fill's (sum + 1) * m, up to 511 * 255) saturates through its high half.
 // The final unpremultiply divides by the new alpha through kReciprocals (see
-// GxBlendRows.h) with 32-bit products. Blocks that cannot change are passed
-// over: no coverage at all, transparent black in the unpremultiply, or (with
-// the text fully opaque) only opaque and clear pixels, which need no
-// division. Pixels past the last whole vector go to
-// the reference, as does every row in the fallback build for x86-64 CPUs
-// without SSE4 (Highway's one-lane "scalar" target).
+// GxBlendRows.h), each split in 16-bit halves so the products stay in 16-bit
+// lanes. Blocks that cannot change are passed over: no coverage at all,
+// transparent black in the unpremultiply, or (with the text fully opaque)
+// only opaque and clear pixels, which need no division; the table draw looks
+// its words up only for blocks it may change. Pixels past the last whole
+// vector go to the reference, as does every row in the fallback build for
+// x86-64 CPUs without SSE4 (Highway's one-lane "scalar" target).
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "effect/GxBlendRows.cpp"
@@ -272,6 +273,46 @@ void DstOver32To32(uint8_t* d, const uint32_t* src, int n) {
     Scalar::DstOver32To32(d + 4 * size_t(done), src + done, n - done);
 }
 
+void DstOverTable32(uint8_t* d, const uint8_t* values, int n, const uint32_t* table) {
+    // As DstOver32To32, the words looked up only for blocks that need them:
+    // not over an all opaque destination, nor where every value picks a
+    // table[0] of 0 (a transparent word leaves any destination alone).
+    const hn::ScalableTag<uint32_t> dw;
+    const hn::Rebind<int32_t, decltype(dw)> di;
+    const hn::Rebind<uint8_t, decltype(dw)> d8w;
+    const size_t words = hn::Lanes(dw);  // half a block
+    const auto full = hn::Set(dw, 255u), zero = hn::Zero(dw);
+    const auto* entries = reinterpret_cast<const int32_t*>(table);
+    const bool clearZero = table[0] == 0;
+    auto lookUp = [&](const uint8_t* at) {
+        return hn::BitCast(dw, hn::GatherIndex(di, entries, hn::BitCast(di, hn::PromoteTo(dw, hn::LoadU(d8w, at)))));
+    };
+    auto swapped = [&](hn::Vec<decltype(dw)> v) {
+        return hn::Or(hn::And(v, hn::Set(dw, 0xFF00FF00u)),
+                      hn::Or(hn::ShiftLeft<16>(hn::And(v, hn::Set(dw, 0xFFu))),
+                             hn::And(hn::ShiftRight<16>(v), hn::Set(dw, 0xFFu))));
+    };
+    const int done = Blocks(n, [&](int i) {
+        if (clearZero && hn::AllTrue(D16(), hn::Eq(Coverage(values + i), hn::Zero(D16())))) return;
+        uint8_t* p = d + 4 * size_t(i);
+        auto* w = reinterpret_cast<uint32_t*>(p);
+        const auto d0 = hn::LoadU(dw, w), d1 = hn::LoadU(dw, w + words);
+        const auto a0 = hn::ShiftRight<24>(d0), a1 = hn::ShiftRight<24>(d1);
+        if (hn::AllTrue(dw, hn::Eq(hn::And(a0, a1), full))) return;
+        const auto s0 = lookUp(values + i), s1 = lookUp(values + i + words);
+        if (hn::AllTrue(dw, hn::Eq(hn::Or(a0, a1), zero))) {
+            hn::StoreU(hn::IfThenElse(hn::Eq(hn::ShiftRight<24>(s0), zero), d0, swapped(s0)), dw, w);
+            hn::StoreU(hn::IfThenElse(hn::Eq(hn::ShiftRight<24>(s1), zero), d1, swapped(s1)), dw, w + words);
+            return;
+        }
+        HWY_ALIGN uint32_t looked[HWY_MAX_BYTES / 2];
+        hn::Store(s0, dw, looked);
+        hn::Store(s1, dw, looked + words);
+        StorePx(DstOverPixels(LoadPx(p), LoadWords(looked), true), p);
+    });
+    Scalar::DstOverTable32(d + 4 * size_t(done), values + done, n - done, table);
+}
+
 void DstOver32To32Bytes(uint8_t* d, const uint8_t* src, int n, int flag) {
     const int done = Blocks(n, [&](int i) {
         uint8_t* p = d + 4 * size_t(i);
@@ -314,12 +355,6 @@ void UnpremultiplyRows(uint8_t* d, int n, uint32_t alpha) {
     const hn::Rebind<uint32_t, decltype(dh)> d32;
     const hn::Rebind<int32_t, decltype(dh)> di32;
     const V t = Const(alpha & 0xFF);
-    const auto most = hn::Set(d32, 255u);
-    auto divide = [&](V q, hn::Vec<decltype(d32)> lo, hn::Vec<decltype(d32)> hi) {
-        auto ql = hn::Min(hn::ShiftRight<16>(hn::Mul(hn::PromoteTo(d32, hn::LowerHalf(dh, q)), lo)), most);
-        auto qh = hn::Min(hn::ShiftRight<16>(hn::Mul(hn::PromoteTo(d32, hn::UpperHalf(dh, q)), hi)), most);
-        return hn::Combine(D16(), hn::DemoteTo(dh, hn::BitCast(di32, qh)), hn::DemoteTo(dh, hn::BitCast(di32, ql)));
-    };
     const hn::ScalableTag<uint32_t> dw;
     const size_t words = hn::Lanes(dw);  // half a block
     const bool plain = (alpha & 0xFF) == 255;
@@ -360,10 +395,16 @@ void UnpremultiplyRows(uint8_t* d, int n, uint32_t alpha) {
         const V a = Scale(D.a, t);
         const auto lo = hn::GatherIndex(d32, kReciprocals.data(), hn::BitCast(di32, hn::PromoteTo(d32, hn::LowerHalf(dh, a))));
         const auto hi = hn::GatherIndex(d32, kReciprocals.data(), hn::BitCast(di32, hn::PromoteTo(d32, hn::UpperHalf(dh, a))));
+        // The reciprocal as high * 2^16 + low (high <= 256): then
+        // (q r) >> 16 = q high + ((q low) >> 16) exactly, at most
+        // 255 * 256 + 254 < 2^16, all in 16-bit lanes.
+        const V high = hn::Combine(D16(), hn::TruncateTo(dh, hn::ShiftRight<16>(hi)), hn::TruncateTo(dh, hn::ShiftRight<16>(lo)));
+        const V low = hn::Combine(D16(), hn::TruncateTo(dh, hi), hn::TruncateTo(dh, lo));
+        auto divide16 = [&](V q) { return Min255(hn::Add(hn::Mul(q, high), hn::MulHigh(q, low))); };
         // The reference's ((v + 1) * t & 0xFF00) / a is 256 q / a with q = (v + 1) * t >> 8.
-        const V r = divide(Scale(D.r, t), lo, hi);
-        const V g = divide(Scale(D.g, t), lo, hi);
-        const V b = divide(Scale(D.b, t), lo, hi);
+        const V r = divide16(Scale(D.r, t));
+        const V g = divide16(Scale(D.g, t));
+        const V b = divide16(Scale(D.b, t));
         StorePx(kSwap ? Px{b, g, r, a} : Px{r, g, b, a}, p);
     });
     if (kSwap) {
@@ -380,7 +421,7 @@ const Table* GetTable() {
     static const Table table = {
         SrcOver8To32,  DstOver8To32,  DstOver8To32NSA,    DstOverSA8To32, Copy8To32,
         Max8To8,       SrcOver32To32, DstOver32To32,      DstOver32To32Bytes, SwapRedBlue,
-        MergeWork,     Unpremultiply, UnpremultiplySwap,
+        MergeWork,     Unpremultiply, UnpremultiplySwap, DstOverTable32,
     };
     return &table;
 }
@@ -580,6 +621,10 @@ void DstOver32To32(uint8_t* d, const uint32_t* src, int n) {
     for (int i = 0; i < n; ++i, d += 4) DstOverPixel(d, Split(src[i]), true);
 }
 
+void DstOverTable32(uint8_t* d, const uint8_t* values, int n, const uint32_t* table) {
+    for (int i = 0; i < n; ++i, d += 4) DstOverPixel(d, Split(table[values[i]]), true);
+}
+
 void DstOver32To32Bytes(uint8_t* d, const uint8_t* src, int n, int flag) {
     for (int i = 0; i < n; ++i, d += 4, src += 4)
         DstOverPixel(d, Channels{src[kA], src[kR], src[kG], src[kB]}, flag != 0);
@@ -628,7 +673,7 @@ const Table& ScalarTable() {
         Scalar::DstOverSA8To32, Scalar::Copy8To32,         Scalar::Max8To8,
         Scalar::SrcOver32To32, Scalar::DstOver32To32,      Scalar::DstOver32To32Bytes,
         Scalar::SwapRedBlue,   Scalar::MergeWork,          Scalar::Unpremultiply,
-        Scalar::UnpremultiplySwap,
+        Scalar::UnpremultiplySwap, Scalar::DstOverTable32,
     };
     return table;
 }

@@ -33,6 +33,7 @@ using Rows32Bytes = void (*)(uint8_t* dst, const uint8_t* src, int n, int flag);
 using RowsSwap = void (*)(uint8_t* pixels, int n);
 using RowsMerge = void (*)(uint8_t* dst, const uint8_t* work, const uint8_t* coverage, int n);
 using RowsUnpremultiply = void (*)(uint8_t* pixels, int n, uint32_t alpha);
+using RowsTable32 = void (*)(uint8_t* dst, const uint8_t* values, int n, const uint32_t* table);
 
 struct Table {
     Rows8To32 srcOver8To32;
@@ -49,6 +50,9 @@ struct Table {
     RowsUnpremultiply unpremultiply;
     // Unpremultiply, then swapRedBlue, in one pass.
     RowsUnpremultiply unpremultiplySwap;
+    // dstOver32To32 of the words table[values[x]] (a glow's colouring and
+    // drawing in one pass).
+    RowsTable32 dstOverTable32;
 };
 
 // The reference kernels: plain C++, one pixel at a time.
@@ -66,6 +70,7 @@ void SwapRedBlue(uint8_t* pixels, int n);
 void MergeWork(uint8_t* dst, const uint8_t* work, const uint8_t* coverage, int n);
 void Unpremultiply(uint8_t* pixels, int n, uint32_t alpha);
 void UnpremultiplySwap(uint8_t* pixels, int n, uint32_t alpha);
+void DstOverTable32(uint8_t* dst, const uint8_t* values, int n, const uint32_t* table);
 }  // namespace Scalar
 
 const Table& ScalarTable();

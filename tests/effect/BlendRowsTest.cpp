@@ -85,6 +85,9 @@ TEST(BlendRows, EveryKernelGivesTheReferenceBytes) {
             std::vector<uint32_t> words(static_cast<size_t>(n));
             std::memcpy(words.data(), src32.data(), src32.size());
             const uint32_t colour = bytes.Colour();
+            std::vector<uint32_t> table(256);  // a 0 first entry in even rounds, as a glow's
+            for (auto& word : table) word = bytes.Colour();
+            if (round % 2 == 0) table[0] = 0;
             const uint32_t alpha = round == 0 || round == 5 ? 255u : bytes.Next();
 
             const std::pair<const char*, Call> cases32[] = {
@@ -105,6 +108,7 @@ TEST(BlendRows, EveryKernelGivesTheReferenceBytes) {
                 {"mergeWork", [&](const Table& t, uint8_t* d, int k) { t.mergeWork(d, src32.data(), cov.data(), k); }},
                 {"unpremultiply", [&](const Table& t, uint8_t* d, int k) { t.unpremultiply(d, k, alpha); }},
                 {"unpremultiplySwap", [&](const Table& t, uint8_t* d, int k) { t.unpremultiplySwap(d, k, alpha); }},
+                {"dstOverTable32", [&](const Table& t, uint8_t* d, int k) { t.dstOverTable32(d, cov.data(), k, table.data()); }},
             };
             const Call max8 = [&](const Table& t, uint8_t* d, int k) { t.max8To8(d, cov.data(), k); };
 

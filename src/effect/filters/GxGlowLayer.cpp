@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "effect/GxBlendRows.h"
 #include "effect/GxBlender.h"
 #include "effect/GxEffectMath.h"
 #include "effect/filters/GxColorRamp.h"
@@ -68,7 +69,8 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
 // one image pixel, so the row order changes nothing). Rows [Rg, H - Rg) are
 // blurred vertically into a byte row and then horizontally into colour;
 // `shade[v]` is the premultiplied colour of result v. `row` and `values` are
-// W bytes of scratch, `colours` W words.
+// W bytes of scratch, `colours` W words (the outer glow colours each pixel as
+// it draws it, in one pass, and needs no colour row).
 //
 // With a `frame` the image is W x H and the frame fills the rows and columns
 // the passes cannot reach. Without one (a frame of transparent pixels, which
@@ -93,6 +95,8 @@ void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const G
     // inner glow this matters at one place: the box filter's 0 in the plane's
     // first and last column is not blurred back in as "inside".
     std::memset(row, 0, stride);
+    const BlendRows::RowsTable32 over = BlendRows::Active().dstOverTable32;
+    const bool drawable = dst->pixels != nullptr && dst->bytesPerPixel == 4;
     // Rows that land off `dst` are not worked out.
     const int64_t firstVisible = -int64_t(top), endVisible = int64_t(dst->height) - top;
     for (int32_t y = R; y < plan.height - R; ++y) {
@@ -101,11 +105,16 @@ void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const G
         blur(row + R, 1, n, g, inverted, values + R);
         // Results never exceed 255, so entry 256 (past the edge colour) is
         // only reached by the rule min(v, 256) on paper.
-        colour(values + R, n, shade, colours + R);
         if (frame != nullptr) {
+            colour(values + R, n, shade, colours + R);
             draw(y, colours, 0, W);  // the frame columns still hold the frame
-        } else {
-            draw(y, colours + R, R, n);
+        } else if (drawable) {
+            // Coloured as drawn: columns [R, W - R) at left + R, clipped to dst.
+            const int64_t from = std::max<int64_t>(int64_t(left) + R, 0);
+            const int64_t to = std::min<int64_t>(int64_t(left) + R + n, int64_t(dst->width));
+            if (from < to)
+                over(dst->pixels + (size_t(top + y) * dst->width + size_t(from)) * 4,
+                     values + (from - (int64_t(left) + R)) + R, int(to - from), shade);
         }
     }
     if (frame == nullptr) return;
