@@ -8,8 +8,10 @@
 // vector each; on x86 two such pairs share one pairwise multiply-add
 // (BlurBlocksPaired). The division is GxDivisor's (x * m) >> s with a 64-bit product:
 // even and odd 32-bit lanes are multiplied apart (MulEven) and put back
-// together. Columns past the last whole vector take the scalar form of the
-// same arithmetic, as does the whole row in the fallback build for x86-64 CPUs
+// together. A row that does not end on a whole vector ends with one that
+// overlaps the one before it (outputs never alias inputs, so the bytes written
+// twice are alike); rows narrower than a vector take the scalar form of the
+// same arithmetic, as does every row in the fallback build for x86-64 CPUs
 // without SSE4 (Highway's one-lane "scalar" target).
 
 #undef HWY_TARGET_INCLUDE
@@ -109,7 +111,7 @@ HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_
         finish(lo0, hi0, out + x);
         finish(lo1, hi1, out + x + N);
     }
-    for (; x + N <= n; x += N) {
+    auto single = [&](int x) {
         const uint8_t* at = c + x;
         auto lo = hn::Zero(di32), hi = hn::Zero(di32);
         accumulate(hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at))), R >= 1 ? pair(at, step) : hn::Zero(di16),
@@ -119,6 +121,13 @@ HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_
             accumulate(pair(at, ptrdiff_t(i) * step), pair(at, ptrdiff_t(i + 1) * step), weightsOf(i), lo, hi);
         if (i == R) accumulate(pair(at, ptrdiff_t(R) * step), hn::Zero(di16), weightsOf(i), lo, hi);
         finish(lo, hi, out + x);
+    };
+    for (; x + N <= n; x += N) single(x);
+    // The last columns: one block that overlaps the one before (its bytes
+    // are worked out again, alike; out never aliases the samples).
+    if (x < n && n >= N) {
+        single(n - N);
+        x = n;
     }
     return x;
 }
@@ -144,7 +153,7 @@ void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGauss
     const int shift = int(g.divide.shift);
     const auto full = hn::Set(d32, g.full);
     const auto most = hn::Set(d32, 255u);
-    for (; x + N <= n; x += N) {
+    auto block = [&](int x) {
         const auto centre = hn::Mul(hn::PromoteTo(d16, hn::LoadU(d8, c + x)), hn::Set(d16, uint16_t(w[0])));
         auto lo = hn::PromoteTo(d32, hn::LowerHalf(dh16, centre));
         auto hi = hn::PromoteTo(d32, hn::UpperHalf(dh16, centre));
@@ -164,10 +173,17 @@ void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGauss
         hi = hn::Min(Divide(d32, hi, multiplier, shift), most);
         hn::StoreU(hn::DemoteTo(dh8, hn::BitCast(di32, lo)), dh8, out + x);
         hn::StoreU(hn::DemoteTo(dh8, hn::BitCast(di32, hi)), dh8, out + x + half);
+    };
+    for (; x + N <= n; x += N) block(x);
+    // The last columns: one block that overlaps the one before (its bytes
+    // are worked out again, alike; out never aliases the samples).
+    if (x < n && n >= N) {
+        block(n - N);
+        x = n;
     }
 #endif
-    // The columns past the last whole vector; the whole row in the build for
-    // CPUs without the vector instructions.
+    // A row narrower than a vector; every row in the build for CPUs without
+    // the vector instructions.
     for (; x < n; ++x) {
         uint32_t sum = uint32_t(w[0]) * c[x];
         for (int i = 1; i <= R; ++i) {
@@ -191,10 +207,17 @@ void SpreadRow(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT ro
         return hn::Add(hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, above + at)), hn::PromoteTo(d16, hn::LoadU(d8, row + at))),
                        hn::PromoteTo(d16, hn::LoadU(d8, below + at)));
     };
-    for (; x + N + 1 <= width; x += N) {
-        const auto sum = hn::Add(hn::Add(column(x - 1), column(x)), column(x + 1));
+    auto block = [&](int at) {
+        const auto sum = hn::Add(hn::Add(column(at - 1), column(at)), column(at + 1));
         const auto v = hn::Min(hn::ShiftRight<2>(sum), hn::Set(d16, 255));
-        hn::StoreU(hn::DemoteTo(d8, hn::BitCast(hn::Rebind<int16_t, decltype(d16)>(), v)), d8, out + x);
+        hn::StoreU(hn::DemoteTo(d8, hn::BitCast(hn::Rebind<int16_t, decltype(d16)>(), v)), d8, out + at);
+    };
+    for (; x + N + 1 <= width; x += N) block(x);
+    // The last columns: one block that overlaps the one before (out never
+    // aliases the rows it reads).
+    if (x + 1 < width && width >= N + 2) {
+        block(width - 1 - N);
+        x = width - 1;
     }
 #endif
     for (; x + 1 < width; ++x) {
@@ -214,9 +237,14 @@ void ShadeRow(const uint8_t* HWY_RESTRICT values, int n, const uint32_t* HWY_RES
     const hn::Rebind<uint32_t, decltype(di32)> du32;
     const int N = int(hn::Lanes(di32));
     const auto* words = reinterpret_cast<const int32_t*>(table);
-    for (; x + N <= n; x += N) {
-        const auto index = hn::BitCast(di32, hn::PromoteTo(du32, hn::LoadU(d8, values + x)));
-        hn::StoreU(hn::BitCast(du32, hn::GatherIndex(di32, words, index)), du32, out + x);
+    auto block = [&](int at) {
+        const auto index = hn::BitCast(di32, hn::PromoteTo(du32, hn::LoadU(d8, values + at)));
+        hn::StoreU(hn::BitCast(du32, hn::GatherIndex(di32, words, index)), du32, out + at);
+    };
+    for (; x + N <= n; x += N) block(x);
+    if (x < n && n >= N) {  // one block overlapping the one before
+        block(n - N);
+        x = n;
     }
 #endif
     for (; x < n; ++x) out[x] = table[values[x]];

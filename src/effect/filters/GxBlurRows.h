@@ -9,7 +9,8 @@
 //     out[x] = min(sum / S, 255), or min((255 * S - sum) / S, 255) when inverted
 //
 // for x in [0, n). Every tap must be readable: the caller keeps R steps of
-// samples on either side. The quotient never exceeds 255 (the sum is at most
+// samples on either side; `out` must not overlap them (the kernels may write
+// an output twice). The quotient never exceeds 255 (the sum is at most
 // 255 * S), so the clamp is only the rule written out.
 //
 // The literal loop, with a division per sample, is the reference; the kernels
@@ -29,11 +30,13 @@ using BlurRow = void (*)(const uint8_t* centre, ptrdiff_t step, int n, const GxG
                          bool inverted, uint8_t* out);
 // The glow's spread: for x in [1, width - 1), out[x] = min(255, s >> 2) with s
 // the sum of the 3 x 3 samples around x in the rows above, at and below.
-// out[0] and out[width - 1] are not written. width >= 3.
+// out[0] and out[width - 1] are not written. width >= 3; `out` overlaps none
+// of the rows.
 using SpreadRow = void (*)(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width,
                            uint8_t* out);
 
-// The glow's colouring: out[x] = table[values[x]] for x in [0, n).
+// The glow's colouring: out[x] = table[values[x]] for x in [0, n), out apart
+// from values.
 using ShadeRow = void (*)(const uint8_t* values, int n, const uint32_t* table, uint32_t* out);
 
 struct Table {
