@@ -292,7 +292,7 @@ struct SpreadGeometry {
     int reach;          // R + widest
     size_t pitch;       // bytes per span table row
     size_t table;       // bytes per span table
-    size_t terms;       // bytes of the term list, a multiple of 64
+    size_t terms;       // bytes of the term list and the ink flags, a multiple of 64
 };
 
 bool Geometry(int w, int h, int frame, int R, int widest, int spans, size_t levels, SpreadGeometry* g) {
@@ -310,8 +310,13 @@ bool Geometry(int w, int h, int frame, int R, int widest, int spans, size_t leve
     g->reach = R + widest;
     g->pitch = size_t(pitch);
     g->table = table;
-    g->terms = (levels * sizeof(StrokeRows::Term) + 63) / 64 * 64;
+    g->terms = (levels * sizeof(StrokeRows::Term) + size_t(height) + 63) / 64 * 64;
     return true;
+}
+
+// Whether the n bytes from p are all 0.
+bool AllZero(const unsigned char* p, size_t n) {
+    return n == 0 || (p[0] == 0 && std::memcmp(p, p + 1, n - 1) == 0);
 }
 
 // The part of a w x h plane placed at (x, y) that lands on `dst` or on
@@ -356,6 +361,8 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
         return;
     const StrokeRows::Table& rows = StrokeRows::Active();
     auto* terms = reinterpret_cast<StrokeRows::Term*>(work);
+    // ink[y]: whether table row y holds a non-zero sample.
+    unsigned char* ink = work + levels_.size() * sizeof(StrokeRows::Term);
     unsigned char* tables = work + g.terms;
 
     // The source rows the window reads.
@@ -383,6 +390,7 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
             std::memset(to + w, frameValue, size_t(frame));
         }
         std::memset(framed + g.width, 0, size_t(g.reach));
+        ink[y] = !AllZero(framed, size_t(g.width));
     }
     // Table j from table j - 1: the larger of two neighbouring spans. Runs
     // only read spans that end inside the row.
@@ -391,6 +399,7 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
         unsigned char* table = tables + size_t(j) * g.table;
         const int n = int(g.pitch) - (1 << j) + 1;
         for (int y = firstRow; y < endRow; ++y) {
+            if (!ink[y]) continue;  // no term reads it
             const size_t at = size_t(y) * g.pitch;
             rows.maxRow(below + at, below + at + (1 << (j - 1)), n, table + at);
         }
@@ -410,14 +419,17 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
         // Kernel rows ky reach source row y - ky.
         const int kyFirst = y - (g.height - 1) > 0 ? y - (g.height - 1) : 0;
         const int kyEnd = y + 1 < D_ ? y + 1 : D_;
+        // A source row of zeros proposes nothing: its terms are left out.
         int flat = 0;
         for (int ky : order_) {
             const Row& r = rows_[size_t(ky)];
-            if (ky < kyFirst || ky >= kyEnd || r.count == 0 || levels_[size_t(r.first)].cut != 0) continue;
+            if (ky < kyFirst || ky >= kyEnd || r.count == 0 || levels_[size_t(r.first)].cut != 0 || !ink[y - ky])
+                continue;
             terms[flat++] = term(levels_[size_t(r.first)], y - ky);
         }
         int count = flat;
         for (int ky = kyFirst; ky < kyEnd; ++ky) {
+            if (!ink[y - ky]) continue;
             const Row& r = rows_[size_t(ky)];
             for (int i = 0; i < r.count; ++i) {
                 const Level& level = levels_[size_t(r.first + i)];
