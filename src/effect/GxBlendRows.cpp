@@ -129,10 +129,25 @@ void SrcOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
 
 void DstOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c = ColourOf(color);
+    // Blocks over an all opaque destination stay as they are; full coverage
+    // over an all transparent one is the colour at coverage 255, one word.
+    const hn::ScalableTag<uint32_t> dw;
+    const size_t words = hn::Lanes(dw);  // half a block
+    auto atFull = [&](uint32_t v) { return ((v + 1) * 255) >> 8; };
+    const auto solid = hn::Set(dw, atFull(color >> 24) << 24 | atFull(color & 0xFF) << 16 |
+                                       atFull((color >> 8) & 0xFF) << 8 | atFull((color >> 16) & 0xFF));
     const int done = Blocks(n, [&](int i) {
         const V m = Coverage(cov + i);
         if (NoCoverage(m)) return;
         uint8_t* p = d + 4 * size_t(i);
+        auto* w = reinterpret_cast<uint32_t*>(p);
+        const auto a0 = hn::ShiftRight<24>(hn::LoadU(dw, w)), a1 = hn::ShiftRight<24>(hn::LoadU(dw, w + words));
+        if (hn::AllTrue(dw, hn::Eq(hn::And(a0, a1), hn::Set(dw, 255u)))) return;
+        if (hn::AllTrue(dw, hn::Eq(hn::Or(a0, a1), hn::Zero(dw))) && hn::AllTrue(D16(), hn::Eq(m, Const(255)))) {
+            hn::StoreU(solid, dw, w);
+            hn::StoreU(solid, dw, w + words);
+            return;
+        }
         const Px D = LoadPx(p);
         const Px S = {Scale(c.r, m), Scale(c.g, m), Scale(c.b, m), Scale(c.a, m)};
         const V k = hn::Sub(Const(255), D.a);
