@@ -250,7 +250,6 @@ bool StrokeChords::plan(const unsigned char* k, int D) {
     try {
         levels_.clear();
         rows_.assign(size_t(D), Row());
-        order_.clear();
         int widest = 0;
         for (int ky = 0; ky < D; ++ky) {
             const unsigned char* row = k + size_t(ky) * D + R;  // the centre column
@@ -266,11 +265,21 @@ bool StrokeChords::plan(const unsigned char* k, int D) {
             }
             rows_[size_t(ky)].count = int(levels_.size()) - rows_[size_t(ky)].first;
         }
-        order_.push_back(R);
+        steps_.clear();
+        auto full = [&](int ky) {
+            const Row& r = rows_[size_t(ky)];
+            if (r.count > 0 && levels_[size_t(r.first)].cut == 0) steps_.push_back(Step{ky, r.first});
+        };
+        full(R);
         for (int step = 1; step <= R; ++step) {
-            order_.push_back(R - step);
-            order_.push_back(R + step);
+            full(R - step);
+            full(R + step);
         }
+        flatSteps_ = steps_.size();
+        for (int ky = 0; ky < D; ++ky)
+            for (int i = 0; i < rows_[size_t(ky)].count; ++i)
+                if (levels_[size_t(rows_[size_t(ky)].first + i)].cut != 0)
+                    steps_.push_back(Step{ky, rows_[size_t(ky)].first + i});
         widest_ = widest;
         spans_ = 1;
         while ((2 << (spans_ - 1)) <= 2 * widest + 1) ++spans_;
@@ -292,7 +301,7 @@ struct SpreadGeometry {
     int reach;          // R + widest
     size_t pitch;       // bytes per span table row
     size_t table;       // bytes per span table
-    size_t terms;       // bytes of the term list and the ink flags, a multiple of 64
+    size_t terms;       // bytes of the term list, its templates and the ink flags, a multiple of 64
 };
 
 bool Geometry(int w, int h, int frame, int R, int widest, int spans, size_t levels, SpreadGeometry* g) {
@@ -310,7 +319,7 @@ bool Geometry(int w, int h, int frame, int R, int widest, int spans, size_t leve
     g->reach = R + widest;
     g->pitch = size_t(pitch);
     g->table = table;
-    g->terms = (levels * sizeof(StrokeRows::Term) + size_t(height) + 63) / 64 * 64;
+    g->terms = (levels * (2 * sizeof(StrokeRows::Term) + sizeof(int)) + size_t(height) + 63) / 64 * 64;
     return true;
 }
 
@@ -360,9 +369,13 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
         window.left > outWidth - window.width || window.top > outHeight - window.height)
         return;
     const StrokeRows::Table& rows = StrokeRows::Active();
+    // The row's terms; every step's term for source row 0 and its kernel
+    // row; ink[y]: whether table row y holds a non-zero sample.
+    const size_t steps = steps_.size();
     auto* terms = reinterpret_cast<StrokeRows::Term*>(work);
-    // ink[y]: whether table row y holds a non-zero sample.
-    unsigned char* ink = work + levels_.size() * sizeof(StrokeRows::Term);
+    StrokeRows::Term* templates = terms + steps;
+    auto* kernelRows = reinterpret_cast<int*>(templates + steps);
+    unsigned char* ink = reinterpret_cast<unsigned char*>(kernelRows + steps);
     unsigned char* tables = work + g.terms;
 
     // The source rows the window reads.
@@ -405,37 +418,29 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
         }
     }
 
-    // One output row at a time: the full levels of the kernel rows that
-    // reach a source row, centre first, then every rim level. Output column
-    // `window.left` centres on source column window.left - R.
-    const unsigned char* spanBase[32];
-    for (int j = 0; j < spans_; ++j)
-        spanBase[j] = tables + size_t(j) * g.table + size_t(g.reach - R_ + window.left);
-    auto term = [&](const Level& level, int sy) {
-        const unsigned char* centre = spanBase[level.span] + size_t(sy) * g.pitch;
-        return StrokeRows::Term{centre + level.left, centre + level.right, level.cut};
-    };
+    // One output row at a time, the steps whose kernel row reaches a source
+    // row with ink. Output column `window.left` centres on source column
+    // window.left - R.
+    for (size_t i = 0; i < steps; ++i) {
+        const Level& level = levels_[size_t(steps_[i].level)];
+        const unsigned char* centre = tables + size_t(level.span) * g.table + size_t(g.reach - R_ + window.left);
+        templates[i] = StrokeRows::Term{centre + level.left, centre + level.right, level.cut};
+        kernelRows[i] = steps_[i].ky;
+    }
     for (int y = window.top; y < window.top + window.height; ++y) {
-        // Kernel rows ky reach source row y - ky.
-        const int kyFirst = y - (g.height - 1) > 0 ? y - (g.height - 1) : 0;
-        const int kyEnd = y + 1 < D_ ? y + 1 : D_;
-        // A source row of zeros proposes nothing: its terms are left out.
-        int flat = 0;
-        for (int ky : order_) {
-            const Row& r = rows_[size_t(ky)];
-            if (ky < kyFirst || ky >= kyEnd || r.count == 0 || levels_[size_t(r.first)].cut != 0 || !ink[y - ky])
-                continue;
-            terms[flat++] = term(levels_[size_t(r.first)], y - ky);
-        }
-        int count = flat;
-        for (int ky = kyFirst; ky < kyEnd; ++ky) {
-            if (!ink[y - ky]) continue;
-            const Row& r = rows_[size_t(ky)];
-            for (int i = 0; i < r.count; ++i) {
-                const Level& level = levels_[size_t(r.first + i)];
-                if (level.cut != 0) terms[count++] = term(level, y - ky);
+        // Kernel row ky reaches source row y - ky; a row of zeros proposes
+        // nothing, so its terms are left out.
+        auto take = [&](size_t from, size_t to, int count) {
+            for (size_t i = from; i < to; ++i) {
+                const int sy = y - kernelRows[i];
+                if (unsigned(sy) >= unsigned(g.height) || !ink[sy]) continue;
+                const size_t offset = size_t(sy) * g.pitch;
+                terms[count++] = StrokeRows::Term{templates[i].a + offset, templates[i].b + offset, templates[i].cut};
             }
-        }
+            return count;
+        };
+        const int flat = take(0, flatSteps_, 0);
+        const int count = take(flatSteps_, steps, flat);
         rows.dilateRow(terms, flat, count, window.width, out + size_t(y - window.top) * outStride);
     }
 }

@@ -92,7 +92,14 @@ private:
     int spans_ = 0;   // span tables: 2^0 .. 2^(spans_ - 1)
     std::vector<Level> levels_;
     std::vector<Row> rows_;
-    std::vector<int> order_;  // kernel rows, centre first, then outward
+    // The order terms are read in: every full level, its kernel row centre
+    // first, then outward; then every rim level.
+    struct Step {
+        int ky;
+        int level;
+    };
+    std::vector<Step> steps_;
+    size_t flatSteps_ = 0;
 };
 
 class GxStroke : public GxECoreBase {
