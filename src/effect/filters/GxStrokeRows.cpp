@@ -3,9 +3,10 @@
 // Vector form: a block of output bytes is built in one register: for every
 // term the two span reads are combined with a byte maximum, the cut is a
 // saturating subtraction, and the block keeps the running maximum. Two
-// blocks go through the terms together (more would rarely all fill up);
-// after each pair of flat terms, blocks that are 255 throughout skip the
-// rest.
+// blocks go through the first full levels together (more would rarely all
+// fill up), then on alone, or in quarters of 16 bytes where only a few are
+// short of 255; after each pair of full levels, blocks that are 255
+// throughout skip the rest.
 // A row that does not end on a whole block finishes with one block that
 // overlaps the one before it (the bytes it writes twice are the same), so
 // nothing outside [0, n) is read or written; a row narrower than one block
@@ -31,26 +32,29 @@ const Table* GetTable() { return &ReferenceTable(); }
 namespace hn = hwy::HWY_NAMESPACE;
 using D8 = hn::ScalableTag<uint8_t>;
 
-// Blocks [x, x + kBlocks * N): the term's reads and its cut are fetched once
-// for all of them.
-template <int kBlocks>
-HWY_INLINE void DilateBlocks(const Term* HWY_RESTRICT terms, int flat, int count, int x,
-                             uint8_t* HWY_RESTRICT out) {
-    const D8 d;
+// Blocks [x, x + kBlocks * N) of the tag's width, from term `i` on, each
+// starting from what `out` holds: the term's reads and its cut are fetched
+// once for all of them.
+template <class DB, int kBlocks>
+HWY_INLINE void Finish(const Term* HWY_RESTRICT terms, int flat, int count, int i, int x, uint8_t* HWY_RESTRICT out) {
+    const DB d;
     const int N = int(hn::Lanes(d));
     const auto full = hn::Set(d, 255);
-    hn::Vec<D8> acc[kBlocks];
-    for (int k = 0; k < kBlocks; ++k) acc[k] = hn::Zero(d);
-    int i = 0;
+    hn::Vec<DB> acc[kBlocks];
+    for (int k = 0; k < kBlocks; ++k) acc[k] = hn::LoadU(d, out + x + k * N);
+    auto filled = [&] {
+        auto least = acc[0];
+        for (int k = 1; k < kBlocks; ++k) least = hn::Min(least, acc[k]);
+        return hn::AllTrue(d, hn::Eq(least, full));
+    };
+    if (filled()) return;
     for (; i < flat; ++i) {
         const uint8_t* a = terms[i].a + x;
         const uint8_t* b = terms[i].b + x;
         for (int k = 0; k < kBlocks; ++k)
             acc[k] = hn::Max(acc[k], hn::Max(hn::LoadU(d, a + k * N), hn::LoadU(d, b + k * N)));
         if ((i & 1) == 0) continue;
-        auto least = acc[0];
-        for (int k = 1; k < kBlocks; ++k) least = hn::Min(least, acc[k]);
-        if (hn::AllTrue(d, hn::Eq(least, full))) break;
+        if (filled()) break;
     }
     if (i >= flat) {
         for (i = flat; i < count; ++i) {
@@ -64,6 +68,44 @@ HWY_INLINE void DilateBlocks(const Term* HWY_RESTRICT terms, int flat, int count
         }
     }
     for (int k = 0; k < kBlocks; ++k) hn::StoreU(acc[k], d, out + x + k * N);
+}
+
+// Full levels a group of blocks reads together before each block goes on
+// alone: most blocks inside the stroke fill up sooner.
+inline constexpr int kTogether = 8;
+using D16 = hn::CappedTag<uint8_t, 16>;
+
+// Blocks [x, x + kBlocks * N). Together while the budget lasts; then each
+// block not yet full goes on alone, and one with few pixels short of 255
+// goes on in quarters of 16 bytes, only those quarters that are not full:
+// along the ends of the stroke most of a block fills up early and a few
+// pixels read every term. Any split gives the same bytes.
+template <int kBlocks>
+HWY_INLINE void DilateBlocks(const Term* HWY_RESTRICT terms, int flat, int count, int x, uint8_t* HWY_RESTRICT out) {
+    const D8 d;
+    const int N = int(hn::Lanes(d));
+    for (int k = 0; k < kBlocks; ++k) hn::StoreU(hn::Zero(d), d, out + x + k * N);
+    if (count <= 6 * kTogether) {  // few terms: splitting would not pay
+        Finish<D8, kBlocks>(terms, flat, count, 0, x, out);
+        return;
+    }
+    const int together = flat < kTogether ? flat : kTogether;
+    Finish<D8, kBlocks>(terms, together, together, 0, x, out);  // full levels only
+    if (together == flat && flat == count) return;
+    const D16 dq;
+    const int Q = int(hn::Lanes(dq));
+    for (int k = 0; k < kBlocks; ++k) {
+        uint8_t* block = out + x + k * N;
+        if (Q < N) {
+            int open = 0;
+            for (int q = 0; q < N; q += Q) open += !hn::AllTrue(dq, hn::Eq(hn::LoadU(dq, block + q), hn::Set(dq, 255)));
+            if (2 * open * Q <= N) {
+                for (int q = 0; q < N; q += Q) Finish<D16, 1>(terms, flat, count, together, x + k * N + q, out);
+                continue;
+            }
+        }
+        Finish<D8, 1>(terms, flat, count, together, x + k * N, out);
+    }
 }
 
 void DilateRow(const Term* HWY_RESTRICT terms, int flat, int count, int n, uint8_t* HWY_RESTRICT out) {

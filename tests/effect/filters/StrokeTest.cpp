@@ -171,18 +171,25 @@ TEST(StrokeRows, EveryKernelGivesTheReferenceBytes) {
     widths.insert(widths.end(), {100, 257, 1031});
     for (int n : widths) {
         const std::vector<uint8_t> a = bytes(size_t(n) + 40), b = bytes(size_t(n) + 40);
-        for (int round = 0; round < 4; ++round) {
-            // Round 0 has no full terms, round 3 a full 255 source (blocks stop early).
+        for (int round = 0; round < 12; ++round) {
+            const int kind = round % 4;
+            // Kind 0 has no full terms, kind 2 enough for blocks to go on
+            // alone or in quarters, from a source of 255 but for one run of
+            // random bytes (a few pixels stay short of 255), kind 3 a full
+            // 255 source (blocks stop early).
             std::vector<StrokeRows::Term> terms;
-            const int flat = round == 0 ? 0 : int(rng() % 6);
-            const int count = flat + int(rng() % 8);
+            const int flat = kind == 0 ? 0 : int(rng() % (kind == 2 ? 24 : 6));
+            const int count = flat + int(rng() % (kind == 2 ? 64 : 8));
+            std::vector<uint8_t> run(size_t(n) + 40, 255);
+            const size_t at = rng() % run.size(), length = std::min<size_t>(50 + rng() % 20, run.size() - at);
+            for (size_t i = at; i < at + length; ++i) run[i] = rng() % 2 ? uint8_t(rng()) : 0;
             for (int i = 0; i < count; ++i) {
-                const std::vector<uint8_t>& from = i % 2 ? a : b;
+                const std::vector<uint8_t>& from = kind == 2 ? run : i % 2 ? a : b;
                 terms.push_back({from.data() + rng() % 40, from.data() + rng() % 40,
                                  uint8_t(i < flat ? 0 : rng() % 256)});
             }
             std::vector<uint8_t> full(size_t(n) + 40, 255);
-            if (round == 3 && flat > 0) terms[0].a = full.data();
+            if (kind == 3 && flat > 0) terms[0].a = full.data();
             std::vector<uint8_t> want = bytes(size_t(n));
             const std::vector<uint8_t> poison = want;
             StrokeRows::Reference::DilateRow(terms.data(), flat, count, n, want.data());
