@@ -276,10 +276,14 @@ bool StrokeChords::plan(const unsigned char* k, int D) {
             full(R + step);
         }
         flatSteps_ = steps_.size();
-        for (int ky = 0; ky < D; ++ky)
+        rimFrom_.assign(size_t(D) + 1, 0);
+        for (int ky = 0; ky <= D; ++ky) {
+            rimFrom_[size_t(ky)] = steps_.size();
+            if (ky == D) break;
             for (int i = 0; i < rows_[size_t(ky)].count; ++i)
                 if (levels_[size_t(rows_[size_t(ky)].first + i)].cut != 0)
                     steps_.push_back(Step{ky, rows_[size_t(ky)].first + i});
+        }
         widest_ = widest;
         spans_ = 1;
         while ((2 << (spans_ - 1)) <= 2 * widest + 1) ++spans_;
@@ -440,7 +444,9 @@ void StrokeChords::spread(const unsigned char* source, int stride, int w, int h,
             return count;
         };
         const int flat = take(0, flatSteps_, 0);
-        const int count = take(flatSteps_, steps, flat);
+        const int kyFirst = y - (g.height - 1) > 0 ? y - (g.height - 1) : 0;
+        const int kyEnd = y + 1 < D_ ? y + 1 : D_;
+        const int count = take(rimFrom_[size_t(kyFirst)], rimFrom_[size_t(kyEnd)], flat);
         rows.dilateRow(terms, flat, count, window.width, out + size_t(y - window.top) * outStride);
     }
 }

@@ -100,6 +100,7 @@ private:
     };
     std::vector<Step> steps_;
     size_t flatSteps_ = 0;
+    std::vector<size_t> rimFrom_;  // per kernel row (and D), its first rim step
 };
 
 class GxStroke : public GxECoreBase {

@@ -126,6 +126,12 @@ void MaxRow(const uint8_t* HWY_RESTRICT a, const uint8_t* HWY_RESTRICT b, int n,
     const int N = int(hn::Lanes(d));
     int x = 0;
     for (; x + N <= n; x += N) hn::StoreU(hn::Max(hn::LoadU(d, a + x), hn::LoadU(d, b + x)), d, out + x);
+    // The last bytes: one vector overlapping the one before (out is apart
+    // from a and b).
+    if (x < n && n >= N) {
+        hn::StoreU(hn::Max(hn::LoadU(d, a + n - N), hn::LoadU(d, b + n - N)), d, out + n - N);
+        x = n;
+    }
     for (; x < n; ++x) out[x] = a[x] > b[x] ? a[x] : b[x];
 }
 

@@ -31,7 +31,8 @@ struct Term {
 };
 
 using DilateRow = void (*)(const Term* terms, int flat, int count, int n, uint8_t* out);
-// out[x] = max(a[x], b[x]), x in [0, n): one row of the span table from the row below.
+// out[x] = max(a[x], b[x]), x in [0, n): one row of the span table from the row
+// below (out apart from a and b).
 using MaxRow = void (*)(const uint8_t* a, const uint8_t* b, int n, uint8_t* out);
 // out[x] = min(out[x], other[x]): the band of a centred stroke.
 using MinRow = void (*)(uint8_t* out, const uint8_t* other, int n);
