@@ -52,11 +52,17 @@
 // (kernel row, level) thus costs two reads a pixel whatever its length, and
 // a whole block of pixels goes through it at once (GxStrokeRows). The full
 // levels (t = 255, the disc's inside) come first, centre row outward, and a
-// block that they fill to 255 is finished without the rim levels. Blocks
-// inside the stroke mostly fill up after a few terms; blocks that stay
-// below 255 (along the stroke's outer edge and beyond it) read all D full
-// terms and every rim term, so there the cost still grows with the radius.
-// Only the part of the output that lands on a target is worked out.
+// block that they fill to 255 is finished without the rim levels. A kernel
+// row whose source row holds only zeros proposes nothing at any level, so
+// its terms are left out of the output row's list (and its span tables are
+// not built): rows above and below the glyphs read only the kernel rows that
+// reach ink. Blocks inside the stroke mostly fill up after a few terms; the
+// kernel splits the rest into smaller blocks, so that along the stroke's
+// ends only the few pixels short of 255 read on. Those pixels (the outer
+// edge, and beyond it wherever ink rows are within reach) still read every
+// term of their row, so there the cost grows with the radius: D full terms
+// and about as many rim terms, two reads each. Only the part of the output
+// that lands on a target is worked out.
 //
 // Every disc makeCircleKernel makes has that shape: distances only grow
 // along a row, the float steps that turn them into bytes never reverse an
