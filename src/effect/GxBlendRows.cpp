@@ -29,8 +29,10 @@
 // transparent black in the unpremultiply, or (with the text fully opaque)
 // only opaque and clear pixels, which need no division; the table draw looks
 // its words up only for blocks it may change. Pixels past the last whole
-// vector go to the reference, as does every row in the fallback build for
-// x86-64 CPUs without SSE4 (Highway's one-lane "scalar" target).
+// vector go through the same kernel on a padded copy (the drawing rows) or to
+// the reference (the picture-wide ones), and every row goes to the reference
+// in the fallback build for x86-64 CPUs without SSE4 (Highway's one-lane
+// "scalar" target).
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "effect/GxBlendRows.cpp"
@@ -38,6 +40,8 @@
 #include <hwy/highway.h>
 
 #include "effect/GxBlendRows.h"
+
+#include <cstring>
 
 HWY_BEFORE_NAMESPACE();
 namespace Glimmer::BlendRows::HWY_NAMESPACE {
@@ -108,6 +112,23 @@ HWY_INLINE int Blocks(int n, Block block) {
     return i;
 }
 
+// Pixels past the last whole vector: the kernel itself on one vector of
+// copies. Lanes past the row are padding whose results are dropped, and
+// every lane's result depends on that lane's inputs alone, so the row's
+// last pixels come out as the reference makes them.
+template <typename Kernel, typename Input, typename... Rest>
+HWY_INLINE void Tail(Kernel kernel, uint8_t* d, const Input* in, int n, int done, Rest... rest) {
+    const int k = n - done;
+    if (k <= 0) return;
+    constexpr int kMax = HWY_MAX_BYTES / 2;  // lanes of D16
+    uint8_t pixels[4 * kMax] = {};
+    Input inputs[kMax] = {};
+    std::memcpy(pixels, d + 4 * size_t(done), 4 * size_t(k));
+    std::memcpy(inputs, in + done, sizeof(Input) * size_t(k));
+    kernel(pixels, inputs, int(hn::Lanes(D16())), rest...);
+    std::memcpy(d + 4 * size_t(done), pixels, 4 * size_t(k));
+}
+
 void SrcOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const Px c = ColourOf(color);
     const V a1 = Const((color >> 24) + 1);
@@ -124,7 +145,7 @@ void SrcOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
                          Min255(hn::Add(Scale(D.b, k), Scale(c.b, m))), Min255(hn::Add(a, Scale(D.a, k)))};
         StorePx(Select(hn::Lt(s, Const(256)), D, over), p);
     });
-    Scalar::SrcOver8To32(d + 4 * size_t(done), cov + done, n - done, color);
+    Tail(SrcOver8To32, d, cov, n, done, color);
 }
 
 void DstOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
@@ -156,7 +177,7 @@ void DstOver8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
         const auto keep = hn::Or(hn::Eq(D.a, Const(255)), hn::Eq(m, Const(0)));
         StorePx(Select(keep, D, Select(hn::Eq(D.a, Const(0)), S, under)), p);
     });
-    Scalar::DstOver8To32(d + 4 * size_t(done), cov + done, n - done, color);
+    Tail(DstOver8To32, d, cov, n, done, color);
 }
 
 void DstOver8To32NSA(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
@@ -172,7 +193,7 @@ void DstOver8To32NSA(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
         const auto keep = hn::Or(hn::Eq(D.a, Const(255)), hn::Eq(m, Const(0)));
         StorePx(Select(keep, D, Select(hn::Eq(D.a, Const(0)), c, under)), p);
     });
-    Scalar::DstOver8To32NSA(d + 4 * size_t(done), cov + done, n - done, color);
+    Tail(DstOver8To32NSA, d, cov, n, done, color);
 }
 
 void DstOverSA8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
@@ -217,7 +238,7 @@ void DstOverSA8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
         out = Select(hn::Eq(D.a, Const(0)), S, out);
         StorePx(Select(hn::Eq(m, Const(0)), D, out), p);
     });
-    Scalar::DstOverSA8To32(d + 4 * size_t(done), cov + done, n - done, color);
+    Tail(DstOverSA8To32, d, cov, n, done, color);
 }
 
 void Copy8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
@@ -225,7 +246,7 @@ void Copy8To32(uint8_t* d, const uint8_t* cov, int n, uint32_t color) {
     const int done = Blocks(n, [&](int i) {
         StorePx(Px{c.r, c.g, c.b, Scale(c.a, Coverage(cov + i))}, d + 4 * size_t(i));
     });
-    Scalar::Copy8To32(d + 4 * size_t(done), cov + done, n - done, color);
+    Tail(Copy8To32, d, cov, n, done, color);
 }
 
 void Max8To8(uint8_t* d, const uint8_t* cov, int n) {
@@ -247,7 +268,7 @@ void SrcOver32To32(uint8_t* d, const uint32_t* src, int n) {
                    Min255(hn::Add(S.b, Scale(D.b, k))), Min255(hn::Add(S.a, Scale(D.a, k)))},
                 p);
     });
-    Scalar::SrcOver32To32(d + 4 * size_t(done), src + done, n - done);
+    Tail(SrcOver32To32, d, src, n, done);
 }
 
 HWY_INLINE Px DstOverPixels(const Px& D, const Px& S, bool copyOverClear) {
@@ -285,7 +306,7 @@ void DstOver32To32(uint8_t* d, const uint32_t* src, int n) {
         }
         StorePx(DstOverPixels(LoadPx(p), LoadWords(src + i), true), p);
     });
-    Scalar::DstOver32To32(d + 4 * size_t(done), src + done, n - done);
+    Tail(DstOver32To32, d, src, n, done);
 }
 
 void DstOverTable32(uint8_t* d, const uint8_t* values, int n, const uint32_t* table) {
@@ -325,7 +346,7 @@ void DstOverTable32(uint8_t* d, const uint8_t* values, int n, const uint32_t* ta
         hn::Store(s1, dw, looked + words);
         StorePx(DstOverPixels(LoadPx(p), LoadWords(looked), true), p);
     });
-    Scalar::DstOverTable32(d + 4 * size_t(done), values + done, n - done, table);
+    Tail(DstOverTable32, d, values, n, done, table);
 }
 
 void DstOver32To32Bytes(uint8_t* d, const uint8_t* src, int n, int flag) {
