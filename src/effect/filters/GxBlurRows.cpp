@@ -6,9 +6,11 @@
 // added (at most 510) and multiplied by their weight (at most 128, so the
 // product stays below 2^16), and the products summed in 32-bit lanes, half a
 // vector each; on x86 two such pairs share one pairwise multiply-add
-// (BlurBlocksPaired). The division is GxDivisor's (x * m) >> s with a 64-bit product:
-// even and odd 32-bit lanes are multiplied apart (MulEven) and put back
-// together. A row that does not end on a whole vector ends with one that
+// (BlurBlocksPaired). Two neighbouring rows down the columns load each
+// sample once for both (BlurRowsPaired); two spread rows share the sum of
+// their two middle rows. The division is GxDivisor's (x * m) >> s with a
+// 64-bit product: even and odd 32-bit lanes are multiplied apart (MulEven)
+// and put back together. A row that does not end on a whole vector ends with one that
 // overlaps the one before it (outputs never alias inputs, so the bytes written
 // twice are alike); rows narrower than a vector take the scalar form of the
 // same arithmetic, as does every row in the fallback build for x86-64 CPUs
@@ -131,6 +133,85 @@ HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_
     }
     return x;
 }
+
+// Two rows at once, the second centred one step past the first: each block
+// loads the samples of the R + 1 steps either side once for both (rows
+// s[-R] .. s[R + 1]), each carried into the next pair of taps.
+template <class D16>
+HWY_INLINE bool BlurRowsPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g,
+                               bool inverted, uint8_t* HWY_RESTRICT out0, uint8_t* HWY_RESTRICT out1) {
+    const int R = g.radius;
+    const int* w = g.weights;
+    const hn::Rebind<uint8_t, D16> d8;
+    const hn::Repartition<int32_t, D16> di32;
+    const hn::Repartition<uint32_t, D16> du32;
+    const hn::Repartition<int16_t, D16> di16;
+    const int N = int(hn::Lanes(d16));
+    if (n < N) return false;
+    const auto multiplier = hn::Set(du32, uint32_t(g.divide.multiplier));
+    const int shift = int(g.divide.shift);
+    const auto full = hn::Set(du32, g.full);
+    const auto most = hn::Set(du32, 255u);
+    uint32_t pairs[kMaxFilterRadius / 2 + 1];
+    for (int i = 0; i <= R; i += 2) pairs[i / 2] = uint32_t(w[i]) | (i < R ? uint32_t(w[i + 1]) << 16 : 0u);
+    using V16 = hn::Vec<decltype(di16)>;
+    using V32 = hn::Vec<decltype(di32)>;
+    auto finish = [&](V32 lo, V32 hi, uint8_t* to) {
+        auto sumLo = hn::BitCast(du32, lo), sumHi = hn::BitCast(du32, hi);
+        if (inverted) {
+            sumLo = hn::Sub(full, sumLo);
+            sumHi = hn::Sub(full, sumHi);
+        }
+        const auto qLo = hn::BitCast(di32, hn::Min(Divide(du32, sumLo, multiplier, shift), most));
+        const auto qHi = hn::BitCast(di32, hn::Min(Divide(du32, sumHi, multiplier, shift), most));
+        hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, to);
+    };
+    auto unused = hn::Zero(di32);
+    auto accumulate = [&](V16 a, V16 b, V16 wv, V32& lo, V32& hi) {
+        lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
+        hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
+    };
+    auto weightsOf = [&](int i) { return hn::BitCast(di16, hn::Set(du32, pairs[i / 2])); };
+    auto block = [&](int x) {
+        const uint8_t* at = c + x;
+        auto s = [&](int k) { return hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at + ptrdiff_t(k) * step))); };
+        auto lo0 = hn::Zero(di32), hi0 = hn::Zero(di32), lo1 = hn::Zero(di32), hi1 = hn::Zero(di32);
+        const V16 s0 = s(0), s1 = s(1);
+        if (R == 0) {
+            accumulate(s0, hn::Zero(di16), weightsOf(0), lo0, hi0);
+            accumulate(s1, hn::Zero(di16), weightsOf(0), lo1, hi1);
+        } else {
+            // Taps 0 and 1: row 0 takes s0 and s[-1] + s1, row 1 takes s1 and s0 + s2.
+            V16 carriedLow = s(-1), carriedHigh = s(2);
+            accumulate(s0, hn::Add(carriedLow, s1), weightsOf(0), lo0, hi0);
+            accumulate(s1, hn::Add(s0, carriedHigh), weightsOf(0), lo1, hi1);
+            // Taps i and i + 1 with C = s[1 - i] and D = s[i] carried in:
+            // row 0 takes s[-i] + D and s[-i - 1] + s[i + 1], row 1 takes
+            // C + s[i + 1] and s[-i] + s[i + 2].
+            int i = 2;
+            for (; i < R; i += 2) {
+                const V16 a = s(-i - 1), b = s(-i), e = s(i + 1), f = s(i + 2);
+                const auto wv = weightsOf(i);
+                accumulate(hn::Add(b, carriedHigh), hn::Add(a, e), wv, lo0, hi0);
+                accumulate(hn::Add(carriedLow, e), hn::Add(b, f), wv, lo1, hi1);
+                carriedLow = a;
+                carriedHigh = f;
+            }
+            if (i == R) {
+                const V16 b = s(-R), e = s(R + 1);
+                const auto wv = weightsOf(R);
+                accumulate(hn::Add(b, carriedHigh), hn::Zero(di16), wv, lo0, hi0);
+                accumulate(hn::Add(carriedLow, e), hn::Zero(di16), wv, lo1, hi1);
+            }
+        }
+        finish(lo0, hi0, out0 + x);
+        finish(lo1, hi1, out1 + x);
+    };
+    int x = 0;
+    for (; x + N <= n; x += N) block(x);
+    if (x < n) block(n - N);  // overlaps the block before: the same bytes again
+    return true;
+}
 #endif
 
 void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted,
@@ -195,6 +276,15 @@ void BlurRow(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGauss
     }
 }
 
+void BlurRows2(const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted,
+               uint8_t* HWY_RESTRICT out0, uint8_t* HWY_RESTRICT out1) {
+#if HWY_ARCH_X86 && HWY_TARGET != HWY_SCALAR && HWY_TARGET != HWY_EMU128
+    if (BlurRowsPaired(hn::ScalableTag<uint16_t>(), c, step, n, g, inverted, out0, out1)) return;
+#endif
+    BlurRow(c, step, n, g, inverted, out0);
+    BlurRow(c + step, step, n, g, inverted, out1);
+}
+
 void SpreadRow(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT row,
                const uint8_t* HWY_RESTRICT below, int width, uint8_t* HWY_RESTRICT out) {
     int x = 1;
@@ -228,6 +318,39 @@ void SpreadRow(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT ro
     }
 }
 
+void SpreadRows2(const uint8_t* HWY_RESTRICT above, const uint8_t* HWY_RESTRICT row, const uint8_t* HWY_RESTRICT next,
+                 const uint8_t* HWY_RESTRICT below, int width, uint8_t* HWY_RESTRICT out0, uint8_t* HWY_RESTRICT out1) {
+#if HWY_TARGET != HWY_SCALAR
+    // The two middle rows' sum serves both outputs.
+    const hn::ScalableTag<uint16_t> d16;
+    const hn::Rebind<uint8_t, decltype(d16)> d8;
+    const int N = int(hn::Lanes(d16));
+    if (width >= N + 2) {
+        auto at16 = [&](const uint8_t* p, int at) { return hn::PromoteTo(d16, hn::LoadU(d8, p + at)); };
+        auto finish = [&](hn::Vec<decltype(d16)> sum, uint8_t* to) {
+            const auto v = hn::Min(hn::ShiftRight<2>(sum), hn::Set(d16, 255));
+            hn::StoreU(hn::DemoteTo(d8, hn::BitCast(hn::Rebind<int16_t, decltype(d16)>(), v)), d8, to);
+        };
+        auto block = [&](int at) {
+            auto first = hn::Zero(d16), second = hn::Zero(d16);
+            for (int k = -1; k <= 1; ++k) {
+                const auto middle = hn::Add(at16(row, at + k), at16(next, at + k));
+                first = hn::Add(first, hn::Add(middle, at16(above, at + k)));
+                second = hn::Add(second, hn::Add(middle, at16(below, at + k)));
+            }
+            finish(first, out0 + at);
+            finish(second, out1 + at);
+        };
+        int x = 1;
+        for (; x + N + 1 <= width; x += N) block(x);
+        if (x + 1 < width) block(width - 1 - N);  // overlaps the block before: the same bytes again
+        return;
+    }
+#endif
+    SpreadRow(above, row, next, width, out0);
+    SpreadRow(row, next, below, width, out1);
+}
+
 void ShadeRow(const uint8_t* HWY_RESTRICT values, int n, const uint32_t* HWY_RESTRICT table,
               uint32_t* HWY_RESTRICT out) {
     int x = 0;
@@ -251,7 +374,7 @@ void ShadeRow(const uint8_t* HWY_RESTRICT values, int n, const uint32_t* HWY_RES
 }
 
 const Table* GetTable() {
-    static const Table table = {BlurRow, SpreadRow, ShadeRow};
+    static const Table table = {BlurRow, SpreadRow, ShadeRow, BlurRows2, SpreadRows2};
     return &table;
 }
 
@@ -278,6 +401,16 @@ void BlurRow(const uint8_t* c, ptrdiff_t step, int n, const GxGaussian& g, bool 
 void ShadeRow(const uint8_t* values, int n, const uint32_t* table, uint32_t* out) {
     for (int x = 0; x < n; ++x) out[x] = table[values[x]];
 }
+void BlurRows2(const uint8_t* c, ptrdiff_t step, int n, const GxGaussian& g, bool inverted, uint8_t* out0,
+               uint8_t* out1) {
+    BlurRow(c, step, n, g, inverted, out0);
+    BlurRow(c + step, step, n, g, inverted, out1);
+}
+void SpreadRows2(const uint8_t* above, const uint8_t* row, const uint8_t* next, const uint8_t* below, int width,
+                 uint8_t* out0, uint8_t* out1) {
+    SpreadRow(above, row, next, width, out0);
+    SpreadRow(row, next, below, width, out1);
+}
 void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out) {
     for (int x = 1; x + 1 < width; ++x) {
         unsigned s = 0;
@@ -289,7 +422,8 @@ void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, i
 }  // namespace Reference
 
 const Table& ReferenceTable() {
-    static const Table table = {Reference::BlurRow, Reference::SpreadRow, Reference::ShadeRow};
+    static const Table table = {Reference::BlurRow, Reference::SpreadRow, Reference::ShadeRow, Reference::BlurRows2,
+                                Reference::SpreadRows2};
     return table;
 }
 

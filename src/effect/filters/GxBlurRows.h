@@ -38,11 +38,22 @@ using SpreadRow = void (*)(const uint8_t* above, const uint8_t* row, const uint8
 // The glow's colouring: out[x] = table[values[x]] for x in [0, n), out apart
 // from values.
 using ShadeRow = void (*)(const uint8_t* values, int n, const uint32_t* table, uint32_t* out);
+// Two blur rows: out0 centred on `centre`, out1 on centre + step (the caller
+// keeps R + 1 steps of samples below); the x86 builds load each sample once
+// for both.
+using BlurRows2 = void (*)(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian,
+                           bool inverted, uint8_t* out0, uint8_t* out1);
+
+// Two spread rows: out0 of (above, row, next), out1 of (row, next, below).
+using SpreadRows2 = void (*)(const uint8_t* above, const uint8_t* row, const uint8_t* next, const uint8_t* below,
+                             int width, uint8_t* out0, uint8_t* out1);
 
 struct Table {
     BlurRow blurRow;
     SpreadRow spreadRow;
     ShadeRow shadeRow;
+    BlurRows2 blurRows2;
+    SpreadRows2 spreadRows2;
 };
 
 namespace Reference {
@@ -50,6 +61,10 @@ void BlurRow(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gau
              uint8_t* out);
 void SpreadRow(const uint8_t* above, const uint8_t* row, const uint8_t* below, int width, uint8_t* out);
 void ShadeRow(const uint8_t* values, int n, const uint32_t* table, uint32_t* out);
+void BlurRows2(const uint8_t* centre, ptrdiff_t step, int n, const GxGaussian& gaussian, bool inverted,
+               uint8_t* out0, uint8_t* out1);
+void SpreadRows2(const uint8_t* above, const uint8_t* row, const uint8_t* next, const uint8_t* below, int width,
+                 uint8_t* out0, uint8_t* out1);
 }  // namespace Reference
 
 const Table& ReferenceTable();

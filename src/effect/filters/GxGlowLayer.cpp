@@ -68,8 +68,8 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
 // its top-left corner at (left, top) as it is made (each pixel of `dst` takes
 // one image pixel, so the row order changes nothing). Rows [Rg, H - Rg) are
 // blurred vertically into a byte row and then horizontally into colour;
-// `shade[v]` is the premultiplied colour of result v. `row` and `values` are
-// W bytes of scratch, `colours` W words (the outer glow colours each pixel as
+// `shade[v]` is the premultiplied colour of result v. `row`, `next` and
+// `values` are W bytes of scratch, `colours` W words (the outer glow colours each pixel as
 // it draws it, in one pass, and needs no colour row).
 //
 // With a `frame` the image is W x H and the frame fills the rows and columns
@@ -77,11 +77,12 @@ void FillPlane(unsigned char* plane, const GlowPlan& plan, const GxBitmap& mask,
 // destination-over leaves alone) only the part the passes reach is drawn.
 void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const GxGaussian& g, bool inverted,
                        const uint32_t* shade, const uint32_t* frame, const GxBitmap* dst, int left, int top,
-                       unsigned char* row, unsigned char* values, uint32_t* colours) {
+                       unsigned char* row, unsigned char* next, unsigned char* values, uint32_t* colours) {
     const int32_t W = plan.width, R = plan.radius;
     const size_t stride = size_t(W);
     const int n = W - 2 * R;
     const BlurRows::BlurRow blur = BlurRows::Active().blurRow;
+    const BlurRows::BlurRows2 blurTwo = BlurRows::Active().blurRows2;
     const BlurRows::ShadeRow colour = BlurRows::Active().shadeRow;
     auto draw = [&](int y, const uint32_t* from, int x, int count) {
         GxBlender::drawBitmapBlend32(left + x, top + y, dst, from, count, 1, count, GxE_BLEND_DST_OVER);
@@ -95,14 +96,14 @@ void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const G
     // inner glow this matters at one place: the box filter's 0 in the plane's
     // first and last column is not blurred back in as "inside".
     std::memset(row, 0, stride);
+    std::memset(next, 0, stride);
     const BlendRows::RowsTable32 over = BlendRows::Active().dstOverTable32;
     const bool drawable = dst->pixels != nullptr && dst->bytesPerPixel == 4;
     // Rows that land off `dst` are not worked out.
     const int64_t firstVisible = -int64_t(top), endVisible = int64_t(dst->height) - top;
-    for (int32_t y = R; y < plan.height - R; ++y) {
-        if (y < firstVisible || y >= endVisible) continue;
-        blur(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R);
-        blur(row + R, 1, n, g, inverted, values + R);
+    // Along the row blurred down the columns into `from`, coloured, drawn.
+    auto finish = [&](int32_t y, const unsigned char* from) {
+        blur(from + R, 1, n, g, inverted, values + R);
         // Results never exceed 255, so entry 256 (past the edge colour) is
         // only reached by the rule min(v, 256) on paper.
         if (frame != nullptr) {
@@ -115,6 +116,22 @@ void BlurColourAndDraw(const unsigned char* plane, const GlowPlan& plan, const G
             if (from < to)
                 over(dst->pixels + (size_t(top + y) * dst->width + size_t(from)) * 4,
                      values + (from - (int64_t(left) + R)) + R, int(to - from), shade);
+        }
+    };
+    // Down the columns two rows at a time where both are wanted.
+    auto visible = [&](int32_t y) { return y >= firstVisible && y < endVisible; };
+    for (int32_t y = R; y < plan.height - R;) {
+        if (!visible(y)) {
+            ++y;
+        } else if (y + 1 < plan.height - R && visible(y + 1)) {
+            blurTwo(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R, next + R);
+            finish(y, row);
+            finish(y + 1, next);
+            y += 2;
+        } else {
+            blur(plane + size_t(y) * stride + R, ptrdiff_t(stride), n, g, inverted, row + R);
+            finish(y, row);
+            ++y;
         }
     }
     if (frame == nullptr) return;
@@ -137,17 +154,18 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
                    const GxRect& content) {
     if (plane == nullptr || iterations <= 0 || width <= 0 || height < 3) return true;
     const size_t w = size_t(width);
-    // Two rows for new values on their way back into the plane.
+    // Three rows for new values on their way back into the plane.
     WorkBuffer<unsigned char> own;
     unsigned char* rows = nullptr;
     if (scratch != nullptr) {
-        rows = scratch->get<unsigned char>(GxScratch::kRows, 2 * w);
+        rows = scratch->get<unsigned char>(GxScratch::kRows, 3 * w);
     } else {
-        own = AllocateWork<unsigned char>(2 * w);
+        own = AllocateWork<unsigned char>(3 * w);
         rows = own.get();
     }
     if (rows == nullptr) return false;
     const BlurRows::SpreadRow spread = BlurRows::Active().spreadRow;
+    const BlurRows::SpreadRows2 spreadTwo = BlurRows::Active().spreadRows2;
     // A frame of 255 stays 255 beside the 0 at a row's end (6 x 255 / 4 is
     // past 255), but not between two such ends: planes that narrow are
     // rewritten in full.
@@ -160,15 +178,36 @@ bool GlowBoxFilter(unsigned char* plane, int iterations, int width, int height, 
         const int left = std::max(1, changing.left - pass), right = std::min(width - 1, changing.right + pass);
         if (top < bottom && left < right) {
             const size_t span = size_t(right - left);
-            // Each new row waits in one of two buffers until the row below
-            // it has been worked out, which reads it as it was.
-            for (int y = top; y < bottom; ++y) {
+            // Two rows at a time. The first goes back at once (the next
+            // pair reads from the second on); the second waits in one of
+            // two buffers until the pair below has read it as it was.
+            unsigned char* first = rows;
+            unsigned char* waiting = nullptr;
+            int waitingRow = 0;
+            auto settle = [&] {
+                if (waiting != nullptr) std::memcpy(plane + size_t(waitingRow) * w + left, waiting + left, span);
+            };
+            for (int y = top; y < bottom;) {
                 unsigned char* row = plane + size_t(y) * w;
-                unsigned char* out = rows + size_t(y & 1) * w;
-                spread(row - w + left - 1, row + left - 1, row + w + left - 1, int(span) + 2, out + left - 1);
-                if (y > top) std::memcpy(row - w + left, rows + size_t((y - 1) & 1) * w + left, span);
+                const unsigned char* above = row - w + left - 1;
+                if (y + 1 < bottom) {
+                    unsigned char* second = rows + (waiting == rows + w ? 2 : 1) * w;
+                    spreadTwo(above, row + left - 1, row + w + left - 1, row + 2 * w + left - 1, int(span) + 2,
+                              first + left - 1, second + left - 1);
+                    settle();
+                    std::memcpy(row + left, first + left, span);
+                    waiting = second;
+                    waitingRow = y + 1;
+                    y += 2;
+                } else {
+                    spread(above, row + left - 1, row + w + left - 1, int(span) + 2, first + left - 1);
+                    settle();
+                    std::memcpy(row + left, first + left, span);
+                    waiting = nullptr;
+                    ++y;
+                }
             }
-            std::memcpy(plane + size_t(bottom - 1) * w + left, rows + size_t((bottom - 1) & 1) * w + left, span);
+            settle();
         }
         // Every pass writes 0 at both ends of the rows it rewrites; the
         // first pass reads the ends as they were.
@@ -284,9 +323,9 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     // The box filter is done with the row buffers.
     unsigned char* rows = nullptr;
     if (scratch != nullptr) {
-        rows = scratch->get<unsigned char>(GxScratch::kRows, 2 * size_t(plan.width));
+        rows = scratch->get<unsigned char>(GxScratch::kRows, 3 * size_t(plan.width));
     } else {
-        ownRows = AllocateWork<unsigned char>(2 * size_t(plan.width));
+        ownRows = AllocateWork<unsigned char>(3 * size_t(plan.width));
         rows = ownRows.get();
     }
     if (rows == nullptr) return;
@@ -294,7 +333,8 @@ void GxGlowLayer::drawGlow(GxECore::ParamPostProcessing* p, Side side) {
     // transparent, so only the part the passes reach is drawn.
     const uint32_t white = 0xFFFFFFFFu;
     BlurColourAndDraw(plane, plan, gaussian, inverted, shade, inverted ? &white : nullptr, p->dst,
-                      box.left - 2 * plan.g, box.top - 2 * plan.g, rows, rows + plan.width, colours);
+                      box.left - 2 * plan.g, box.top - 2 * plan.g, rows, rows + plan.width, rows + 2 * size_t(plan.width),
+                      colours);
 }
 
 }  // namespace Glimmer

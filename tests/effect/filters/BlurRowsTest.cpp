@@ -81,19 +81,22 @@ TEST(BlurRows, EveryKernelGivesTheReferenceBytes) {
         ASSERT_TRUE(PlanGaussian(&g, radius, kind.centre, kind.rounding));
         for (int n : widths) {
             for (ptrdiff_t step : {ptrdiff_t(1), ptrdiff_t(n + 2 * radius + 5)}) {
-                // A plane with `radius` steps of samples on either side of the row.
+                // A plane with `radius` steps of samples on either side of the
+                // row and one more below (for the two-row kernels).
                 const size_t margin = size_t(radius) * size_t(step);
-                std::vector<uint8_t> plane = bytes(2 * margin + size_t(n) + 8);
+                std::vector<uint8_t> plane = bytes(2 * margin + size_t(step) + size_t(n) + 8);
                 // Mostly full or empty, as masks are, with random edges.
                 for (size_t i = 0; i < plane.size(); i += 3) plane[i] = plane[i] & 1 ? 255 : 0;
                 const uint8_t* centre = plane.data() + margin;
                 for (bool inverted : {false, true}) {
-                    std::vector<uint8_t> expected = bytes(size_t(n));
+                    std::vector<uint8_t> expected = bytes(size_t(n)), below = bytes(size_t(n));
                     BlurRows::Reference::BlurRow(centre, step, n, g, inverted, expected.data());
+                    BlurRows::Reference::BlurRow(centre + step, step, n, g, inverted, below.data());
                     for (const auto& v : variants) {
-                        std::vector<uint8_t> got = bytes(size_t(n));
+                        std::vector<uint8_t> got = bytes(size_t(n)), first = bytes(size_t(n)), second = bytes(size_t(n));
                         v.table->blurRow(centre, step, n, g, inverted, got.data());
-                        ASSERT_EQ(std::memcmp(got.data(), expected.data(), size_t(n)), 0)
+                        v.table->blurRows2(centre, step, n, g, inverted, first.data(), second.data());
+                        ASSERT_TRUE(got == expected && first == expected && second == below)
                             << v.name << " radius " << radius << " width " << n << " step " << step
                             << (inverted ? " inverted" : "");
                     }
@@ -103,8 +106,9 @@ TEST(BlurRows, EveryKernelGivesTheReferenceBytes) {
     }
 }
 
-// The glow's spread beside its reference, likewise: three random rows, every
-// width from 3 to 66 and some long ones, the two end bytes left alone.
+// The glow's spread beside its reference, likewise: random rows, one output
+// row and two, every width from 3 to 66 and some long ones, the two end bytes
+// left alone.
 TEST(BlurRows, EverySpreadKernelGivesTheReferenceBytes) {
     std::mt19937 random(11);
     auto bytes = [&](size_t n) {
@@ -116,15 +120,18 @@ TEST(BlurRows, EverySpreadKernelGivesTheReferenceBytes) {
     for (int w = 3; w <= 66; ++w) widths.push_back(w);
     widths.insert(widths.end(), {201, 1032, 4100});
     for (int w : widths) {
-        const std::vector<uint8_t> rows = bytes(3 * size_t(w));
+        const std::vector<uint8_t> rows = bytes(4 * size_t(w));
         const uint8_t* above = rows.data();
         std::vector<uint8_t> expected = bytes(size_t(w));
         const std::vector<uint8_t> poison = expected;
+        std::vector<uint8_t> below = poison;
         BlurRows::Reference::SpreadRow(above, above + w, above + 2 * w, w, expected.data());
+        BlurRows::Reference::SpreadRow(above + w, above + 2 * w, above + 3 * w, w, below.data());
         for (const auto& v : BlurRows::Variants()) {
-            std::vector<uint8_t> got = poison;
+            std::vector<uint8_t> got = poison, first = poison, second = poison;
             v.table->spreadRow(above, above + w, above + 2 * w, w, got.data());
-            ASSERT_EQ(got, expected) << v.name << " width " << w;
+            v.table->spreadRows2(above, above + w, above + 2 * w, above + 3 * w, w, first.data(), second.data());
+            ASSERT_TRUE(got == expected && first == expected && second == below) << v.name << " width " << w;
         }
     }
 }
