@@ -76,9 +76,12 @@ struct Picture {
 
 void RenderOnThread(int thread, std::vector<Picture>& last, std::atomic<int>& failures) {
     GxTextObject text;
-    if (!text.Construct() || !text.SetFont(Testing::kDejaVuSans)) {
-        ++failures;
-        return;
+    {
+        std::unique_lock<std::shared_mutex> lock(gFonts);   // may add the font
+        if (!text.Construct() || !text.SetFont(Testing::kDejaVuSans)) {
+            ++failures;
+            return;
+        }
     }
     Platform::Paint paint;
     paint.size = 14.0f;
