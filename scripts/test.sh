@@ -2,7 +2,7 @@
 # Installs what is missing, then configures, builds and runs every test in each
 # preset: the optimised build, the ASan+UBSan build, the ThreadSanitizer build
 # (only the tests that start threads) and the 64-bit Arm cross build under
-# qemu. Pass preset names to run only those.
+# qemu. Pass preset names to run only those (also: fuzz).
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
