@@ -30,7 +30,7 @@ namespace Glimmer {
 namespace {
 
 constexpr int kThreads = 8;
-constexpr int kRounds = 40;
+constexpr int kRounds = 16;
 constexpr int kView = 48;
 
 // Several fonts a family; DejaVu's files are small, so loading stays quick.
