@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <memory>
 #include <vector>
 
 #include "foundation/Error.h"
@@ -14,7 +15,7 @@ void* Item(int i) { return &gItems[i]; }
 
 using Testing::CodeOf;
 
-// The items as indexes into gItems, read through Get (which uses its cache)
+// The items as indexes into gItems, read through Get (which remembers its place)
 // and checked against a plain walk with a cursor.
 std::vector<int> Contents(List& list) {
     std::vector<int> viaGet, viaCursor;
@@ -86,28 +87,46 @@ TEST(List, BuildsAndEditsInOrder) {
 }
 
 TEST(List, IndexedAccessAgreesWithAWalkAfterEdits) {
-    // Get remembers where it was; edits in between must not leave it stale.
-    List list;
-    ASSERT_TRUE(list.Construct());
-    std::vector<int> model;
+    // Get remembers where it was, per thread and per list; edits in between,
+    // walks of other lists (more than it remembers) and a list made anew,
+    // perhaps at a freed one's address, must not leave it stale.
+    constexpr int kLists = 6;
+    std::unique_ptr<List> lists[kLists];
+    std::vector<int> models[kLists];
+    for (auto& list : lists) {
+        list = std::make_unique<List>();
+        ASSERT_TRUE(list->Construct());
+    }
     unsigned seed = 1;
     auto next = [&] { return (seed = seed * 1103515245u + 12345u) >> 16; };
-    for (int step = 0; step < 2000; ++step) {
+    for (int step = 0; step < 6000; ++step) {
+        const int k = int(next() % kLists);
+        List& list = *lists[k];
+        std::vector<int>& model = models[k];
         int count = int(model.size());
-        switch (next() % 4) {
+        switch (next() % 9) {
             case 0:
-            case 1: {
+            case 1:
+            case 2: {
                 int at = int(next() % unsigned(count + 1));
                 int item = int(next() % 16);
                 ASSERT_TRUE(list.Insert(Item(item), at));
                 model.insert(model.begin() + at, item);
                 break;
             }
-            case 2:
+            case 3:
                 if (count > 0) {
                     int at = int(next() % unsigned(count));
                     ASSERT_TRUE(list.Remove(at));
                     model.erase(model.begin() + at);
+                }
+                break;
+            case 4:
+                if (next() % 8 == 0) {
+                    lists[k].reset();
+                    lists[k] = std::make_unique<List>();
+                    ASSERT_TRUE(lists[k]->Construct());
+                    model.clear();
                 }
                 break;
             default:
@@ -117,7 +136,7 @@ TEST(List, IndexedAccessAgreesWithAWalkAfterEdits) {
                 }
         }
     }
-    EXPECT_EQ(Contents(list), model);
+    for (int k = 0; k < kLists; ++k) EXPECT_EQ(Contents(*lists[k]), models[k]);
 }
 
 TEST(List, TenTraversalsAtMost) {

@@ -406,6 +406,20 @@ TEST_F(RenderTest, ALineOutsideTheTextIsRefusedAndTheLastPictureKept) {
     EXPECT_TRUE(std::equal(kept.begin(), kept.end(), good));   // the last picture is still there
 }
 
+TEST_F(RenderTest, APictureTooLargeToHoldIsRefusedBeforeAnythingIsDrawn) {
+    LogCapture log;
+    Prepare(L"", 20.0f);   // drawing would log that the text is empty
+    const unsigned* before = Render(20, 10);
+    ASSERT_NE(before, nullptr);
+    log.Clear();
+    Error::SetError(0);
+    EXPECT_EQ(text.RenderTextEffect(30000, 30000), nullptr);
+    EXPECT_EQ(Error::GetError(), 7);
+    EXPECT_STRNE(Error::GetReason(), "");
+    for (const Testing::LogLine& line : log.Lines()) EXPECT_NE(line.tag, "GxFontDrawing") << line.message;
+    EXPECT_NE(Render(20, 10), nullptr);
+}
+
 TEST_F(RenderTest, FallbackFamiliesDrawTheScriptsTheFontLacks) {
     GxTextObject plain;   // no font of its own: only the system's families
     ASSERT_TRUE(plain.Construct());

@@ -6,9 +6,11 @@
 #            status, one line on stderr naming the problem, and no PNG written
 #            (the messages of every parser are checked in-process)
 # Arguments: -DRENDER=<program> -DWORK=<scratch folder> -DCASE=<group>
-# [-DEMULATOR=<runner>] (the cross build's qemu).
+# [-DEMULATOR=<runner>] (the cross build's qemu, or valgrind; its arguments
+# may be separated by '|').
 
 cmake_minimum_required(VERSION 3.25)
+string(REPLACE "|" ";" EMULATOR "${EMULATOR}")
 
 set(failures 0)
 macro(fail message)

@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <cstring>
 #include <string>
+#include <sys/stat.h>
 #include <unistd.h>
 #include <vector>
 
@@ -275,6 +276,22 @@ TEST(RenderPngTest, WritesThroughATemporaryFileAndReadsBack) {
     EXPECT_EQ(access((std::string(folder) + ".tmp").c_str(), F_OK), -1);
     EXPECT_THROW(WritePng(std::string(folder) + "/missing/out.png", image), RenderError);
     std::remove(path.c_str());
+    rmdir(folder);
+}
+
+TEST(RenderPngTest, JsonAndTilesOnlyFromRegularFilesAndRefusedAtOnce) {
+    // A pipe without a writer would block an open, a device never ends: both
+    // are refused before anything is read.
+    char folder[] = "/tmp/glimmer-render-test-XXXXXX";
+    ASSERT_NE(mkdtemp(folder), nullptr);
+    const std::string pipe = std::string(folder) + "/pipe";
+    ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+    for (const std::string& path : {pipe, std::string("/dev/zero"), std::string(folder)}) {
+        Command command;
+        EXPECT_THROW(ReadJsonFile(path, &command), RenderError) << path;
+        EXPECT_THROW(ReadPng(path, "pattern tile", 16), RenderError) << path;
+    }
+    std::remove(pipe.c_str());
     rmdir(folder);
 }
 

@@ -9,6 +9,7 @@ import android.text.style.BackgroundColorSpan;
 import android.widget.TextView;
 import java.util.Arrays;
 import java.util.List;
+import com.vantrel.android.sdk.gxe.util.GxError;
 import jvmtest.Check;
 import jvmtest.LogTap;
 import jvmtest.Test;
@@ -113,6 +114,18 @@ public class TextStateTest {
         try (GxText text = blockText(view)) {
             Check.isTrue(text.GxText_SetLayout(fiveLines()), "SetLayout");
             Check.isNull(Fixtures.inkBox(text.render()), "no limit and no maxLines");
+        }
+    }
+
+    @Test
+    public void aTextHoldingU0000FailsTheLayoutAndChangesNothing() {
+        try (GxText text = blockText(Fixtures.view(60, 50))) {
+            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f, 12f)), "SetLayout");
+            int[] before = text.render().getPixels();
+            String nul = Fixtures.BLOCK + "\u0000" + Fixtures.BLOCK;
+            Check.isTrue(!text.GxText_SetLayout(Fixtures.line(nul, 40, -20, 5, 20f, 36f)), "refused");
+            Check.isTrue(GxError.getLastReason().contains("U+0000"), "reason: " + GxError.getLastReason());
+            Check.equal(before, text.render().getPixels(), "the old text and lines are kept");
         }
     }
 
@@ -234,8 +247,8 @@ public class TextStateTest {
         try (GxText text = blockText(Fixtures.view(60, 50))) {
             Check.isTrue(text.GxText_SetLayout(new Layout(Fixtures.BLOCK, 100)), "SetLayout");
             Check.isNull(Fixtures.inkBox(text.render()), "ink");
-            // A text of characters that are not UTF-16 pairs still makes the trip.
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line("\uD800x\u0000", 30, -20, 5, 0f, 12f)), "SetLayout");
+            // A text of characters that are not UTF-16 pairs still makes the trip (U+0000 does not: below).
+            Check.isTrue(text.GxText_SetLayout(Fixtures.line("\uD800x", 30, -20, 5, 0f, 12f)), "SetLayout");
         }
     }
 }
