@@ -4,7 +4,6 @@
 #include <gtest/gtest.h>
 
 #include <array>
-#include <bit>
 #include <climits>
 #include <cstdint>
 #include <cstring>
@@ -61,36 +60,22 @@ TEST(BlenderRules, OnePixelByHand) {
         const char* rule;
     } cases[] = {
         {kCoverage, 1, 0x80FF8040, {10, 20, 30, 40}, 255, {255, 138, 79, 148}, "source-over: s = 129 * 255, a = 128"},
-        {kCoverage, 1, 0xFF112233, {9, 9, 9, 9}, 255, {0x11, 0x22, 0x33, 255}, "opaque coverage replaces"},
-        {kCoverage, 1, 0xFEFFFFFF, {1, 2, 3, 4}, 1, {1, 2, 3, 4}, "(254 + 1) * 1 leaves no trace"},
-        {kCoverage, 1, 0x00FFFFFF, {1, 2, 3, 4}, 255, {1, 2, 3, 4}, "transparent colour"},
-        {kCoverage, 1, 0xFFFFFFFF, {0, 0, 0, 0}, 1, {1, 1, 1, 1}, "(255 + 1) * 1 does"},
-        {kCoverage, 2, 0xFF204060, {0, 0, 0, 0}, 128, {16, 32, 48, 128}, "destination-over by coverage"},
+        {kCoverage, 1, 0xFFFFFFFF, {0, 0, 0, 0}, 1, {1, 1, 1, 1}, "(255 + 1) * 1 leaves a trace"},
         {kCoverage, 2, 0xFF204060, {100, 50, 25, 128}, 128, {108, 66, 49, 191}, "destination-over, partial"},
-        {kCoverage, 2, 0xFF204060, {1, 2, 3, 4}, 0, {1, 2, 3, 4}, "no coverage"},
-        {kCoverage, 3, 0x80402010, {0, 0, 0, 0}, 1, {64, 32, 16, 128}, "coverage as a switch"},
         {kCoverage, 3, 0x80402010, {10, 10, 10, 100}, 1, {49, 29, 20, 178}, "switch over partial"},
         {kCoverage, 3, 0x80402010, {10, 10, 10, 100}, 0, {10, 10, 10, 100}, "switch off"},
-        {kCoverage, 7, 0xFF808080, {0, 0, 0, 0}, 128, {64, 64, 64, 128}, "fill: coverage-scaled on clear"},
         {kCoverage, 7, 0xFF808080, {10, 20, 30, 100}, 255, {88, 98, 108, 255}, "fill: full coverage, unscaled"},
-        {kCoverage, 7, 0x80808080, {10, 20, 30, 100}, 255, {88, 98, 108, 178}, "fill: translucent colour"},
         {kCoverage, 7, 0xFF808080, {200, 100, 50, 255}, 128, {100, 50, 25, 128}, "fill over opaque halves"},
         {kCoverage, 7, 0xFF808080, {40, 40, 40, 100}, 128, {40, 40, 40, 89}, "fill: combined, then scaled"},
-        {kCoverage, 7, 0xFF808080, {40, 40, 40, 100}, 0, {40, 40, 40, 100}, "fill outside the glyphs"},
         {kCoverage, 7, 0xFFFF0000, {255, 0, 0, 1}, 254, {255, 0, 0, 253}, "saturates past 16 bits (not 249)"},
         {kWord, 1, 0x80402010, {100, 100, 100, 200}, 0, {114, 82, 66, 227}, "image source-over"},
-        {kWord, 1, 0xFF010203, {100, 100, 100, 200}, 0, {1, 2, 3, 255}, "opaque image source-over"},
-        {kWord, 1, 0x00000000, {100, 90, 80, 70}, 0, {100, 90, 80, 70}, "transparent image source-over"},
         {kWord, 2, 0x80402010, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "image destination-over"},
-        {kWord, 2, 0x80402010, {0, 0, 0, 0}, 0, {64, 32, 16, 128}, "image destination-over on clear"},
         {kWord, 2, 0x00402010, {0, 0, 0, 0}, 0, {0, 0, 0, 0}, "transparent image destination-over"},
         {kWord, 3, 0x80402010, {7, 7, 7, 7}, 0, {7, 7, 7, 7}, "images know no mode 3"},
         {kBytes, 0, 0x40201080, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "byte image destination-over"},
-        {kBytes, 1, 0x40201080, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "its flag changes nothing here"},
         {kBytes, 1, 0x40201080, {5, 5, 5, 0}, 0, {64, 32, 16, 128}, "flag: over alpha 0 the source as it is"},
         {kBytes, 0, 0x40201080, {5, 5, 5, 0}, 0, {69, 37, 21, 128}, "no flag: colour under alpha 0 summed in"},
         {kOverwrite, 0, 0x80112233, {9, 9, 9, 9}, 200, {0x11, 0x22, 0x33, 100}, "overwrite: colour unscaled"},
-        {kOverwrite, 0, 0x80112233, {9, 9, 9, 9}, 0, {0x11, 0x22, 0x33, 0}, "overwrite at no coverage"},
     };
     for (const auto& c : cases) EXPECT_EQ(Draw(c.source, c.mode, c.color, c.dst, c.m), c.expected) << c.rule;
     for (int mode : {0, 4, 5, 6, 8, -1, 1000})
@@ -107,22 +92,14 @@ TEST(BlenderRules, OnlyTheTwoDestinationOverModesLog) {
 }
 
 TEST(BlenderRules, RedBlueSwapGivesJavaWordsAndLeavesMasksAlone) {
-    GxBitmap b(2, 1, 4);
-    Set(b, 0, 0, Px{1, 2, 3, 4});
-    Set(b, 1, 0, Px{0xFF, 0x80, 0x00, 0x7F});
+    GxBitmap b(1, 1, 4), mask(2, 2, 1);
+    Set(b, 0, 0, Px{0xFF, 0x80, 0x00, 0x7F});
     GxBlender::convertBGRAToARGB(&b);
-    EXPECT_EQ(Get(b, 0, 0), (Px{3, 2, 1, 4}));
-    if constexpr (std::endian::native == std::endian::little) {
-        uint32_t word;
-        std::memcpy(&word, b.pixels + 4, 4);
-        EXPECT_EQ(word, 0x7FFF8000u) << "Java reads 0xAARRGGBB";
-    }
-    GxBlender::convertBGRAToARGB(nullptr);
-    GxBitmap mask(2, 2, 1);
+    EXPECT_EQ(Get(b, 0, 0), (Px{0x00, 0x80, 0xFF, 0x7F})) << "little-endian Java reads the word 0x7FFF8000";
     mask.pixels[0] = 1;
-    mask.pixels[2] = 3;
     GxBlender::convertBGRAToARGB(&mask);
-    EXPECT_TRUE(mask.pixels[0] == 1 && mask.pixels[2] == 3) << "a mask was treated as a colour image";
+    GxBlender::convertBGRAToARGB(nullptr);
+    EXPECT_EQ(mask.pixels[0], 1) << "a mask was treated as a colour image";
 }
 
 // --- clipping
@@ -173,8 +150,7 @@ TEST(BlenderClip, MissingOrMismatchedInputsAreNoOps) {
     }
     GxBlender::drawBitmapBlend32(0, 0, &mask, &word, 1, 1, 1, 1);
     GxBlender::drawBitmap(0, 0, &color, &empty, 0);
-    EXPECT_EQ(Get(color, 0, 0), (Px{0, 0, 0, 0}));
-    EXPECT_EQ(mask.pixels[0], 0);
+    EXPECT_TRUE(Get(color, 0, 0) == (Px{0, 0, 0, 0}) && mask.pixels[0] == 0) << "a refused input drew";
 }
 
 TEST(BlenderProperties, DestinationOverNeverChangesAnOpaquePixel) {

@@ -1,10 +1,9 @@
-// The outer and inner shadow: their shared geometry, margins, blurred and
-// moved planes by hand, the full-displacement thresholds, and the shade
-// staying on the glyphs whatever the parameters.
+// The outer and inner shadow: their shared geometry and margins, the
+// full-displacement thresholds, the shade staying on the glyphs whatever the
+// parameters, and the edges. Their pixels are pinned by the picture table.
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <memory>
 #include <random>
 #include <vector>
@@ -58,22 +57,6 @@ TEST(ShadowGeometry, DisplacementRadiusAndMargins) {
     EXPECT_EQ(Inner(45, 100, 100)->getOffset(), 0);
 }
 
-TEST(OuterShadow, MovedAndBlurredByHand) {
-    // Size 0.4: R = 0, the mask only moves (left by 3 at angle 0).
-    GxBitmap mask = MaskFromPicture({"..........", "......##+.", "......#+..", ".........."});
-    EXPECT_EQ(Window(LayerAlpha(*Outer(0, 3, 0.4f), mask, GxRect(5, 1, 9, 3)), 10, 0, 1, 10, 3),
-              (Rows{{0, 0, 0, 255, 255, 128, 0, 0, 0, 0}, {0, 0, 0, 255, 128, 0, 0, 0, 0, 0}}));
-    // Size 1: w = 100, 1 and S = 102. Down the columns one full pixel gives
-    // 250 with 2 above and below; along the rows 250 gives 245 with 2 either
-    // side, and each 2 gives 1: columns first, so not symmetric under
-    // transposition.
-    GxBitmap dot(9, 9, 1);
-    FillRect(dot, 4, 4, 5, 5, 255);
-    std::vector<uint8_t> a = LayerAlpha(*Outer(0, 0, 1), dot, GxRect(4, 4, 5, 5));
-    EXPECT_EQ(Window(a, 9, 3, 3, 6, 6), (Rows{{0, 1, 0}, {2, 245, 2}, {0, 1, 0}}));
-    EXPECT_EQ(std::count(a.begin(), a.end(), 0), 81 - 5);
-}
-
 TEST(OuterShadow, OffCanvasExtremeAndBadInputsAreClean) {
     GxBitmap mask(24, 16, 1);
     FillRect(mask, 2, 4, 10, 12, 255);
@@ -86,22 +69,6 @@ TEST(OuterShadow, OffCanvasExtremeAndBadInputsAreClean) {
     // The largest the stack asks for: a 100 px blur still reaches the block's middle.
     EXPECT_GT(LayerAlpha(*Outer(0, 0, 100), mask, rect)[size_t(8) * 24 + 6], 0);
     EXPECT_TRUE(BadCallsDrawNothing(*Outer(0, 0, 1), mask, rect, GxRect(12, 4, 2, 12)));
-}
-
-TEST(InnerShadow, InvertedMovedAndBlurredByHand) {
-    // Unmoved and unblurred: 255 - coverage, on glyph pixels only.
-    GxBitmap mask = MaskFromPicture({"......", ".##+#.", ".#9#..", "......"});
-    EXPECT_EQ(Window(LayerAlpha(*Inner(0, 0, 0), mask, GxRect(0, 0, 6, 4)), 6, 0, 1, 6, 3),
-              (Rows{{0, 0, 0, 127, 0, 0}, {0, 0, 246, 0, 0, 0}}));
-    // A 4x4 block in an 8x8 box, size 1 (w = 100, 1, S = 102), moved down 2.
-    // Along the rows the inverse is 255 outside the block, 2 on its edge
-    // columns, 0 inside; down the moved columns, from the top: 255,
-    // 25755 / 102 = 252, then 255 / 102 = 2 (edge columns 457 / 102 = 4),
-    // then 0 (edge columns 204 / 102 = 2).
-    GxBitmap block(10, 10, 1);
-    FillRect(block, 2, 2, 6, 6, 255);
-    EXPECT_EQ(Window(LayerAlpha(*Inner(90, 2, 1), block, GxRect(0, 0, 8, 8)), 10, 2, 2, 6, 6),
-              (Rows{{255, 255, 255, 255}, {252, 252, 252, 252}, {4, 2, 2, 4}, {2, 0, 0, 2}}));
 }
 
 TEST(InnerShadow, FullDisplacementThresholds) {
