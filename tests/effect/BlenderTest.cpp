@@ -157,11 +157,8 @@ TEST(BlenderProperties, DestinationOverNeverChangesAnOpaquePixel) {
     GxBitmap b(256, 1, 4);
     std::vector<uint8_t> m(256), full(256, 255);
     std::vector<uint32_t> words(256);
-    for (int i = 0; i < 256; ++i) {
-        Set(b, i, 0, Px{i, 255 - i, i / 2, 255});
-        m[i] = uint8_t(i);
-        words[i] = uint32_t(i) * 0x01010101u;
-    }
+    for (int i = 0; i < 256; ++i)
+        Set(b, i, 0, Px{i, 255 - i, i / 2, 255}), m[i] = uint8_t(i), words[i] = uint32_t(i) * 0x01010101u;
     std::vector<uint8_t> before(b.pixels, b.pixels + 256 * 4);
     for (unsigned color : {0xFFFFFFFFu, 0x80402010u, 0x01FF00FFu}) {
         for (int mode : {2, 3}) GxBlender::drawBitmapBlend8(0, 0, &b, m.data(), 256, 1, 256, color, mode);

@@ -1,6 +1,6 @@
 // The effect stack: ids and replacement, the add operations' conversions,
-// margins, the mode decision and render order, the mask and text box, the
-// final merge, the text layer and the key. Whole renders are pinned by the
+// the mode decision and render order, the mask and the text box the layers
+// are given, the final merge and the key. Whole renders are pinned by the
 // picture table; these are the cases a render does not single out.
 
 #include <gtest/gtest.h>
@@ -21,7 +21,7 @@ namespace {
 // --- a layer that records what the stack hands it
 
 struct Journal {
-    std::vector<std::string> events;  // "init K" and "post K" in call order
+    std::vector<std::string> events;  // "init K" in call order
     std::vector<int> modes;           // the mode every init was given
     std::vector<GxRect> boxes;        // the text box every post was given
 };
@@ -54,7 +54,6 @@ public:
     void render(GxECore::ParamRender*) override {}
     void doPostProcessing(GxECore::ParamPostProcessing* p) override {
         journal_->boxes.push_back(*p->textRect);
-        journal_->events.push_back("post " + std::to_string(style));
         if (paint_ && p->dst != nullptr)
             for (size_t i = 0; i < size_t(p->dst->width) * p->dst->height * 4; ++i) p->dst->pixels[i] = rgba_[i % 4];
     }
@@ -130,8 +129,7 @@ TEST(EffectStackLayers, IdsReplacementRefusalAndRemoval) {
 
 TEST(EffectStackLayers, CopyHasItsOwnLayersWithTheSameIdsAndKey) {
     GxEffect original(nullptr);
-    GxGradient stops[2] = {{0xFF0000FF, 1, 0}, {0xFFFF0000, 1, 1}};
-    original.addOuterGlowText(5, 0xFF00FF00, 1, 2, stops);
+    original.addOuterShadowText(0, 5, 2, 0xFF000000, 1);
     original.addStrokeText(2, 0xFF000000, 1, 0, 1);
     original.removeEffect(0);
     GxEffect copy(original);
@@ -295,7 +293,6 @@ TEST(EffectStackComposite, WorkImageShowsWhereCoverageIsEmpty) {
     s.setDstBitmap(&dst);
     s.renderEffectLayer(0, 0, &glyph);
     s.doEffectPostProcessing();
-    EXPECT_EQ(s.journal.events.back(), "post 12");
     s.compositeLayers(&dst);
     // m = 0 the work pixel, m = 255 the destination, m = 128 a mix
     // (105, 60, 40, 148); then straight colour.
@@ -318,10 +315,8 @@ TEST(EffectStackComposite, TextLayerOverAGlyphAtTheMasksRightEdge) {
         s.renderEffectLayer(1, 0, &glyph);
         s.doEffectPostProcessing();
         s.compositeLayers(&dst);
-        EXPECT_EQ(At(dst, 0), (std::array<int, 4>{0, 0, 0, 0}));
         EXPECT_EQ(At(dst, 2), (std::array<int, 4>{0, 0, 255, 128})) << "the mask's last column was not drawn";
-        EXPECT_EQ(At(dst, 4), (std::array<int, 4>{0, 0, 255, 255}));
-        EXPECT_EQ(At(dst, 5), (std::array<int, 4>{0, 0, 255, 1}));
+        EXPECT_EQ(At(dst, 5), (std::array<int, 4>{0, 0, 255, 1})) << "alpha 1 must keep its full colour";
     }
 }
 

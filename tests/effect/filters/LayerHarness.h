@@ -39,10 +39,6 @@ inline void FillRect(GxBitmap& mask, int left, int top, int right, int bottom, u
         for (int x = left; x < right; ++x) mask.pixels[size_t(y) * mask.width + size_t(x)] = v;
 }
 
-inline std::vector<uint8_t> Bytes(const GxBitmap& mask) {
-    return std::vector<uint8_t>(mask.pixels, mask.pixels + size_t(mask.width) * mask.height);
-}
-
 inline bool SamePixels(const GxBitmap& a, const GxBitmap& b) {
     const size_t bytes = size_t(a.width) * a.height * a.bytesPerPixel;
     return a.width == b.width && a.height == b.height && std::memcmp(a.pixels, b.pixels, bytes) == 0;
@@ -126,7 +122,6 @@ struct LayerCanvas {
         const uint8_t* p = dst.pixels + (size_t(y) * dst.width + x) * 4;
         return {p[0], p[1], p[2], p[3]};
     }
-    int Alpha(int x, int y) const { return At(x, y)[3]; }
 
     bool Untouched() const {
         for (size_t i = 0; i < size_t(dst.width) * dst.height * 4; ++i)
