@@ -79,7 +79,7 @@ TEST(BlenderRules, OnePixelByHand) {
     };
     for (const auto& c : cases) EXPECT_EQ(Draw(c.source, c.mode, c.color, c.dst, c.m), c.expected) << c.rule;
     for (int mode : {0, 4, 5, 6, 8, -1, 1000})
-        EXPECT_EQ(Draw(kCoverage, mode, 0xFFFFFFFF, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4})) << "mode " << mode << " drew";
+        EXPECT_EQ(Draw(kCoverage, mode, ~0u, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4})) << "unknown mode " << mode;
 }
 
 TEST(BlenderRules, OnlyTheTwoDestinationOverModesLog) {

@@ -168,10 +168,10 @@ TEST(EffectStackArguments, AnglesFoldPercentsClampAndColoursPremultiply) {
     // The bevel's two colour opacities are clamped; its layer opacity passes as given.
     s.addBevelText(1, 4.0f, 6.0f, 1, 0, 2, 1.5f, 30.0f, 45.0f, 0xFFFFFFFF, 2.0f, 0xFF000000, -1.0f);
     auto* bevel = Held<GxBevelProperty>(s, 5);
-    EXPECT_EQ((std::vector<float>{Held<GxLinearGradientProperty>(s, 7)->angle, Held<GxRadialGradientProperty>(s, 8)->scale,
-                                  Held<GxStrokeProperty>(s, 10)->size, Held<GxPatternProperty>(s, 11)->scale,
-                                  Held<GxPatternProperty>(s, 11)->opacity, bevel->highlightOpacity,
-                                  bevel->shadowOpacity, bevel->opacity}),
+    EXPECT_EQ((std::vector<float>{Held<GxLinearGradientProperty>(s, 7)->angle,
+                                  Held<GxRadialGradientProperty>(s, 8)->scale, Held<GxStrokeProperty>(s, 10)->size,
+                                  Held<GxPatternProperty>(s, 11)->scale, Held<GxPatternProperty>(s, 11)->opacity,
+                                  bevel->highlightOpacity, bevel->shadowOpacity, bevel->opacity}),
               (std::vector<float>{270, 0, 7, 10, 1, 1, 0, 1.5f}));
     EXPECT_EQ(Held<GxStrokeProperty>(s, 10)->color, 0xFFFFFFFFu);
 

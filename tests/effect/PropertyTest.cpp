@@ -1,5 +1,5 @@
-// Property records: the key bytes of every kind, the clamps and folds of
-// their constructors, and the ownership of copied colour ramps.
+// Property records: key bytes by hand, the clamps and folds of their
+// constructors, and the ownership of copied colour ramps.
 
 #include <gtest/gtest.h>
 
@@ -42,7 +42,7 @@ std::string C(uint32_t c) {
     return s;
 }
 
-TEST(PropertyKey, EveryKindByHand) {
+TEST(PropertyKey, BytesByHandAndNeverAZeroByte) {
     GxGradient glowStops[3] = {{0xFF000000, 1.0f, 0.0f}, {0x80FFFFFF, 1.0f, 0.5f}, {0x00123456, 1.0f, 0.999f}};
     GxGradient rampStops[2] = {{0xFF000000, 1.0f, 0.5f}, {0xFFFFFFFF, 1.0f, 1.0f}};
     GxBitmap tile(2, 2, 4);
@@ -70,8 +70,8 @@ TEST(PropertyKey, EveryKindByHand) {
          K({"B", B({0x81, 0x80, 0x83, 0x80, 0x84, 0x8D, 0x82, 0x81, 0x80, 0x84, 0x80, 0x80 | 120, 0x80 | 30}),
             C(0xFFFFFFFF), C(0xFF000000)}),
          "depth 3 in two nibbles, size 1234 = 0x04D2 in four, 1, 0, 4, angle (0, 120), altitude 30"},
-        {new GxPatternProperty(&tile, 2.5f, 0.5f), 17, K({"P", C(0), B({0x80, 0x80, 0x8F, 0x8A, 0x80, 0x80, 0x83, 0x82})}),
-         "pattern: its opacity"},
+        {new GxPatternProperty(&tile, 2.5f, 0.5f), 17,
+         K({"P", C(0), B({0x80, 0x80, 0x8F, 0x8A, 0x80, 0x80, 0x83, 0x82})}), "pattern: its opacity"},
     };
     for (const auto& c : cases) {
         const std::unique_ptr<GxProperty> record(c.record);
@@ -92,9 +92,8 @@ TEST(PropertyKey, EveryKindByHand) {
 }
 
 TEST(PropertyRecord, ConstructorsClampAndFold) {
-    // Only the inner shadow folds its angle; the sign of the dividend stays,
-    // and values no integer can hold fold without undefined conversions.
-    EXPECT_EQ(GxOuterShadowProperty(-30.7f, 0, 0, 0, 0).angle, -30.7f);
+    // The inner shadow folds its angle (the sign of the dividend stays), and
+    // values no integer can hold fold without undefined conversions.
     EXPECT_EQ(GxInnerShadowProperty(-30.7f, 0, 0, 0, 0).angle, -30.0f);
     EXPECT_EQ(GxInnerShadowProperty(3e30f, 0, 0, 0, 0).angle, float(INT32_MAX % 360));
     EXPECT_EQ(GxInnerShadowProperty(std::nanf(""), 0, 0, 0, 0).angle, 0.0f);

@@ -20,7 +20,8 @@ namespace {
 using Testing::LayerCanvas;
 using Testing::Stop;
 
-constexpr uint32_t kRed = 0xFFFF0000u, kBlack = 0xFF000000u, kWhite = 0xFFFFFFFFu;
+constexpr uint32_t kRed = 0xFFFF0000u, kGreen = 0xFF00FF00u, kBlue = 0xFF0000FFu, kBlack = 0xFF000000u,
+                   kWhite = 0xFFFFFFFFu;
 
 template <typename Layer = GxOuterGlow, typename Record = GxOuterGlowProperty>
 std::unique_ptr<Layer> Glow(float size, uint32_t color, std::vector<GxGradient> stops = {}) {
@@ -47,12 +48,12 @@ TEST(GlowColorTable, SingleColourRampsAndTheFade) {
         {5, {}, 76, kRed, "the fade starts after entry 76"},
         {5, {}, 77, 0xFDFF0000u, "first faded entry"},
         {5, {}, 256, 0u, "the last entry is wholly transparent"},
-        {5, {Stop(0xFF00FF00u, 0.7f)}, 1, 0xFF00FF00u, "one stop: its colour, not the glow's"},
+        {5, {Stop(kGreen, 0.7f)}, 1, kGreen, "one stop: its colour, not the glow's"},
         {5, bw, 64, 0xFF3F3F3Fu, "(255 * 64) >> 8"},
         {5, {Stop(0x00000000u, 0.5f), Stop(kWhite, 1)}, 64, 0x3F3F3F3Fu,
          "the first segment runs from 0 whatever stop 0's position; alpha mixes too"},
         // Stops closer than 1/256: one stop per entry, so the table lags behind t.
-        {5, {Stop(kRed, 0), Stop(0xFF00FF00u, 0.001f), Stop(0xFF0000FFu, 0.002f), Stop(kBlack, 0.003f), Stop(kWhite, 1)},
+        {5, {Stop(kRed, 0), Stop(kGreen, 0.001f), Stop(kBlue, 0.002f), Stop(kBlack, 0.003f), Stop(kWhite, 1)},
          3, 0xFF010101u, "f = trunc((3/256 - 0.003) / 0.997 * 256) = 2"},
         {5, {Stop(kBlack, 0), Stop(kWhite, 0.25f)}, 70, kWhite, "past the last stop: its colour"},
     };
@@ -80,7 +81,7 @@ TEST(GlowBoxFilter, TheContentBoxGivesTheWholePlaneResult) {
                              top + 1 + int(rng() % unsigned(h - top)));
         std::vector<unsigned char> whole(size_t(w) * h, frame);
         for (int y = content.top; y < content.bottom; ++y)
-            for (int x = content.left; x < content.right; ++x) whole[size_t(y) * w + x] = rng() % 3 ? uint8_t(rng()) : frame;
+            for (int x = content.left; x < content.right; ++x) whole[y * w + x] = rng() % 3 ? uint8_t(rng()) : frame;
         std::vector<unsigned char> part = whole;
         const int passes = 1 + int(rng() % 6);
         ASSERT_TRUE(GlowBoxFilter(whole.data(), passes, w, h, nullptr));

@@ -377,7 +377,7 @@ void ExpectModesAndCleanRefusals(const GxReliefVariant& variant, std::vector<Rel
         const int mode = separate ? variant.modeWithWorkImage : variant.modeWithoutWorkImage;
         // Destination-over onto an opaque target changes nothing; source-over does.
         EXPECT_EQ(SamePixels(before, c.dst), mode == 2) << "wrong blend mode, work image " << separate;
-        EXPECT_EQ(SamePixels(extra, empty), !(variant.drawsExtra && separate)) << "extra target, work image " << separate;
+        EXPECT_EQ(SamePixels(extra, empty), !(variant.drawsExtra && separate)) << "extra, work image " << separate;
     }
     ReliefCanvas c(6, 5, 3);
     c.FillSquare(1);
@@ -425,7 +425,7 @@ TEST(Bevel, RadiiAndMargins) {
                   Row{3, 0, 5, 3, 3, 13, false},     // soften wider than the smoothing
                   Row{10, 1, 0, 0, 12, 12, false},   // hard: r + 2, never exact
                   Row{-3, 1, 1, 0, -1, 1, false}}) { // a negative range only empties the windows
-        const GxBevelGeometry g = GxBevel::geometry(MakeRecord<GxBevelProperty>(Relief(1, r.technique, r.size, r.soften)));
+        const auto g = GxBevel::geometry(MakeRecord<GxBevelProperty>(Relief(1, r.technique, r.size, r.soften)));
         EXPECT_TRUE(g.drawable && g.smoothRadius == r.rs && g.range == r.rd && g.margin == r.margin &&
                     g.exact == r.exact && g.gain == (r.technique == 0 ? 1.83f : 1.0f))
             << "wrong geometry for size " << r.size << " technique " << r.technique;

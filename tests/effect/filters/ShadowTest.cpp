@@ -26,8 +26,8 @@ std::unique_ptr<Layer> Make(float angle, float distance, float size) {
     shadow->setProperty(&record);
     return shadow;
 }
-auto Outer = Make<GxOuterShadow, GxOuterShadowProperty>;
-auto Inner = Make<GxInnerShadow, GxInnerShadowProperty>;
+const auto Outer = Make<GxOuterShadow, GxOuterShadowProperty>;
+const auto Inner = Make<GxInnerShadow, GxInnerShadowProperty>;
 
 TEST(ShadowGeometry, DisplacementRadiusAndMargins) {
     EXPECT_EQ(ComputeShadowDisplacement(0, 1e30f).dx, -(1 << 30)) << "a huge distance must clamp, not overflow";
@@ -58,9 +58,10 @@ TEST(OuterShadow, OffCanvasExtremeAndBadInputsAreClean) {
     const GxRect rect(2, 4, 10, 12);
     const std::vector<uint8_t> nothing(24 * 16, 0);
     // Wholly beyond each edge, a refused size, a distance no integer holds.
-    for (auto [angle, distance, size] : std::vector<std::array<float, 3>>{
+    for (auto [a, d, size] : std::vector<std::array<float, 3>>{
              {0, 100, 2}, {90, 100, 2}, {180, 100, 2}, {270, 100, 2}, {0, 0, 1e7f}, {45, 1e30f, 3}})
-        EXPECT_EQ(LayerAlpha(*Outer(angle, distance, size), mask, rect), nothing) << angle << " " << distance << " " << size;
+        EXPECT_EQ(LayerAlpha(*Outer(a, d, size), mask, rect), nothing)
+            << "drew with angle " << a << ", distance " << d << ", size " << size;
     // The largest the stack asks for: a 100 px blur still reaches the block's middle.
     EXPECT_GT(LayerAlpha(*Outer(0, 0, 100), mask, rect)[size_t(8) * 24 + 6], 0);
     EXPECT_TRUE(BadCallsDrawNothing(*Outer(0, 0, 1), mask, rect, GxRect(12, 4, 2, 12)));
@@ -105,8 +106,8 @@ TEST(InnerShadow, NothingOutsideTheGlyphsAndBadInputsAreClean) {
     EXPECT_GE(LayerAlpha(*Inner(45, 100, 100), mask, rect)[8 * 30 + 14], 250);
     EXPECT_EQ(LayerAlpha(*Inner(0, 0, 1e7f), mask, rect), std::vector<uint8_t>(30 * 20, 0)) << "a refused size drew";
     EXPECT_TRUE(BadCallsDrawNothing(*Inner(0, 2, 1), mask, rect, GxRect(27, 2, 3, 18)));
-    EXPECT_EQ(LayerAlpha(*Inner(0, 2, 1), mask, GxRect(3, -5, 27, 40)), LayerAlpha(*Inner(0, 2, 1), mask, GxRect(3, 0, 27, 20)))
-        << "a box past the mask must act as the box clipped to it";
+    EXPECT_EQ(LayerAlpha(*Inner(0, 2, 1), mask, GxRect(3, -5, 27, 40)),
+              LayerAlpha(*Inner(0, 2, 1), mask, GxRect(3, 0, 27, 20))) << "a box past the mask must act as clipped";
 }
 
 }  // namespace
