@@ -1,10 +1,7 @@
 # Fails unless every LOAD segment of LIBRARY is aligned to 16 KB or more, as
 # Android devices with 16 KB memory pages require of the libraries they load.
 # Run as: cmake -DREADELF=<readelf> -DLIBRARY=<file> -P CheckPageAlignment.cmake
-execute_process(COMMAND ${READELF} -lW ${LIBRARY} OUTPUT_VARIABLE listing RESULT_VARIABLE status)
-if(NOT status EQUAL 0)
-  message(FATAL_ERROR "${READELF} failed on ${LIBRARY}")
-endif()
+execute_process(COMMAND ${READELF} -lW ${LIBRARY} OUTPUT_VARIABLE listing COMMAND_ERROR_IS_FATAL ANY)
 string(REGEX MATCHALL "\n *LOAD[^\n]+" segments "${listing}")
 if(NOT segments)
   message(FATAL_ERROR "no LOAD segment in ${LIBRARY}")
@@ -16,5 +13,3 @@ foreach(segment IN LISTS segments)
     message(FATAL_ERROR "a LOAD segment aligned to ${align} bytes:${segment}")
   endif()
 endforeach()
-list(LENGTH segments count)
-message(STATUS "${count} LOAD segments, each aligned to 16 KB or more")

@@ -3,7 +3,7 @@ package jvmtest;
 import java.util.Arrays;
 import java.util.Objects;
 
-/** Assertions; a failed one throws AssertionError with both values. */
+/** Assertions; a failed one throws AssertionError saying what differed, in one line. */
 public final class Check {
     private Check() {}
 
@@ -13,53 +13,36 @@ public final class Check {
         }
     }
 
-    public static void equal(long expected, long actual, String what) {
-        if (expected != actual) {
-            throw new AssertionError(what + ": expected " + expected + ", got " + actual);
-        }
-    }
-
+    /** Values, or int arrays (ink boxes; whole pictures, of which the first differing pixel is named). */
     public static void equal(Object expected, Object actual, String what) {
-        if (!Objects.equals(expected, actual)) {
-            throw new AssertionError(what + ": expected " + expected + ", got " + actual);
+        if (!(expected instanceof int[] && actual instanceof int[])) {
+            isTrue(Objects.equals(expected, actual), what + ": expected " + expected + ", got " + actual);
+            return;
         }
-    }
-
-    public static void equal(int[] expected, int[] actual, String what) {
-        if (!Arrays.equals(expected, actual)) {
-            throw new AssertionError(what + ": expected " + Arrays.toString(expected) + ", got "
-                    + Arrays.toString(actual));
+        int[] e = (int[]) expected, a = (int[]) actual;
+        int i = Arrays.mismatch(e, a);
+        if (i < 0) {
+            return;
+        } else if (e.length <= 4 && a.length <= 4) {
+            throw new AssertionError(what + ": expected " + Arrays.toString(e) + ", got " + Arrays.toString(a));
+        } else if (i >= Math.min(e.length, a.length)) {
+            throw new AssertionError(what + ": expected " + e.length + " values, got " + a.length);
         }
+        throw new AssertionError(String.format("%s: value %d is %08X, expected %08X", what, i, a[i], e[i]));
     }
 
     /** Two 0xAARRGGBB pixels. */
     public static void pixel(int expected, int actual, String what) {
-        if (expected != actual) {
-            throw new AssertionError(String.format("%s: expected pixel %08X, got %08X", what, expected, actual));
-        }
+        isTrue(expected == actual, String.format("%s: expected pixel %08X, got %08X", what, expected, actual));
     }
 
-    public static void isNull(Object value, String what) {
-        if (value != null) {
-            throw new AssertionError(what + ": expected null, got " + value);
-        }
-    }
-
-    public static void notNull(Object value, String what) {
-        if (value == null) {
-            throw new AssertionError(what + ": expected a value, got null");
-        }
-    }
-
-    /** Runs the action and returns what it threw, failing when it threw nothing of that kind. */
-    public static <T extends Throwable> T raises(Class<T> kind, Runnable action, String what) {
+    /** Runs the action, failing unless it throws that kind of exception. */
+    public static void raises(Class<? extends Throwable> kind, Runnable action, String what) {
         try {
             action.run();
         } catch (Throwable t) {
-            if (kind.isInstance(t)) {
-                return kind.cast(t);
-            }
-            throw new AssertionError(what + ": expected " + kind.getSimpleName() + ", got " + t, t);
+            isTrue(kind.isInstance(t), what + ": expected " + kind.getSimpleName() + ", got " + t);
+            return;
         }
         throw new AssertionError(what + ": expected " + kind.getSimpleName() + ", nothing was thrown");
     }

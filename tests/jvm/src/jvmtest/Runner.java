@@ -3,6 +3,7 @@ package jvmtest;
 import java.lang.reflect.InvocationTargetException;
 import java.lang.reflect.Method;
 import java.util.ArrayList;
+import java.util.Arrays;
 import java.util.Comparator;
 import java.util.List;
 
@@ -12,47 +13,32 @@ import java.util.List;
  * when a test failed.
  */
 public final class Runner {
-    public static void main(String[] args) {
+    public static void main(String[] args) throws ClassNotFoundException {
         int passed = 0;
         List<String> failures = new ArrayList<>();
         for (String name : args) {
-            Class<?> suite;
-            try {
-                suite = Class.forName(name);
-            } catch (ClassNotFoundException e) {
-                failures.add(name + ": no such class");
-                continue;
-            }
-            List<Method> tests = new ArrayList<>();
-            for (Method m : suite.getMethods()) {
-                if (m.isAnnotationPresent(Test.class)) {
-                    tests.add(m);
-                }
-            }
-            tests.sort(Comparator.comparing(Method::getName));
+            Class<?> suite = Class.forName(name);
+            Method[] tests = suite.getMethods();
+            Arrays.sort(tests, Comparator.comparing(Method::getName));
             for (Method m : tests) {
+                if (!m.isAnnotationPresent(Test.class)) {
+                    continue;
+                }
                 String id = suite.getSimpleName() + "." + m.getName();
                 try {
                     m.invoke(suite.getDeclaredConstructor().newInstance());
                     passed++;
                     System.out.println("[  OK  ] " + id);
-                } catch (InvocationTargetException e) {
-                    Throwable cause = e.getCause();
+                } catch (ReflectiveOperationException e) {
+                    Throwable cause = e instanceof InvocationTargetException ? e.getCause() : e;
                     failures.add(id + ": " + cause);
                     System.out.println("[ FAIL ] " + id);
                     cause.printStackTrace(System.out);
-                } catch (ReflectiveOperationException e) {
-                    failures.add(id + ": " + e);
-                    System.out.println("[ FAIL ] " + id + ": " + e);
                 }
             }
         }
-        System.out.println();
-        for (String f : failures) {
-            System.out.println("FAILED: " + f);
-        }
+        failures.forEach(f -> System.out.println("FAILED: " + f));
         System.out.println("jvm tests: " + passed + " passed, " + failures.size() + " failed");
-        System.out.flush();
         System.exit(failures.isEmpty() && passed > 0 ? 0 : 1);
     }
 }

@@ -1,82 +1,133 @@
 package com.vantrel.android.sdk.gxe;
 
 import android.graphics.Paint;
+import android.graphics.Typeface;
+import android.os.LocaleList;
+import android.text.FontConfig;
 import android.text.Layout;
 import android.widget.TextView;
 import com.vantrel.android.sdk.gxe.font.FontManager;
 import com.vantrel.android.sdk.gxe.util.GxError;
 import java.nio.file.Files;
 import java.nio.file.Paths;
-import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.List;
+import java.util.function.BooleanSupplier;
 import jvmtest.Check;
 import jvmtest.LogTap;
 import jvmtest.Test;
 
 /**
- * The library under the Java classes of its first version, which declare none of the natives added since:
- * it loads, says at debug level which natives it left out, and the first natives work as they did.
+ * The library under the Java classes of its first version, which declare none of the natives added since,
+ * and framework classes of another version, each missing a method the natives look up. It loads and says
+ * which natives it left out; a native missing a framework method fails (or skips that step) with its log
+ * line, sets no error code and changes nothing; the first natives work as they did.
  */
 public class OlderLayerTest {
     private static final List<String> LOAD_LOG = LogTap.capture(() -> System.loadLibrary("GxEffect.glimmer.vantrel"));
-    private static final String SANS = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf";
 
     @Test
     public void loadsAndNamesTheNativesItLeftOut() {
-        List<String> bridge = new ArrayList<>();
-        for (String line : LOAD_LOG) {
-            if (line.matches("^./(GxText_Common_JNI|GxError_JNI|Init_GxFontManager_JNI|GxText_JNI): .*")) {
-                bridge.add(line);
-            }
+        for (String line : new String[] {"D/GxError_JNI: Init .. Done", "D/Init_GxFontManager_JNI: Init_GxFontManager_JNI",
+                "D/GxText_JNI: JNI_OnLoad .. Done", "D/GxText_Common_JNI: GxText_JNI_OnLoad .... done",
+                "D/GxText_Common_JNI: Error_GetReason ()Ljava/lang/String;: not in com/vantrel/android/sdk/gxe/util/GxError"
+                        + ", not registered",
+                "D/GxText_Common_JNI: GxText_SetLayerStyle (Z)Z: not in com/vantrel/android/sdk/gxe/GxText, not registered"}) {
+            Check.isTrue(LOAD_LOG.contains(line), "no line \"" + line + "\" in the load log " + LOAD_LOG);
         }
-        String gxe = "com/vantrel/android/sdk/gxe/";
-        String text = ": not in " + gxe + "GxText, not registered";
-        Check.equal(Arrays.asList(
-                "D/GxText_Common_JNI: GxText_JNI_OnLoad",
-                "D/GxError_JNI: Init .. Done",
-                "D/Init_GxFontManager_JNI: Init_GxFontManager_JNI",
-                "D/GxText_JNI: JNI_OnLoad .. Done",
-                "D/GxText_Common_JNI: Error_GetReason ()Ljava/lang/String;: not in " + gxe + "util/GxError, not registered",
-                "D/GxText_Common_JNI: GxFontManager_InstallSystemFontFamilies ()Z: not in " + gxe
-                        + "font/FontManager, not registered",
-                "D/GxText_Common_JNI: GxText_AddInnerGlowTextEffect (FIF[I[F[F)I" + text,
-                "D/GxText_Common_JNI: GxText_AddOuterGlowGradientTextEffect (FIF[I[F[F)I" + text,
-                "D/GxText_Common_JNI: GxText_AddRadialGradientTextEffect (F[I[F[FF)I" + text,
-                "D/GxText_Common_JNI: GxText_AddPatternTextEffect ([IIIFF)I" + text,
-                "D/GxText_Common_JNI: GxText_AddBevelTextEffect (IFFIIIFFFIFIF)I" + text,
-                "D/GxText_Common_JNI: GxText_AddEmbossTextEffect (IFFIIIFFFIFIF)I" + text,
-                "D/GxText_Common_JNI: GxText_SetTextOpacity (F)Z" + text,
-                "D/GxText_Common_JNI: GxText_SetLayerStyle (Z)Z" + text,
-                "D/GxText_Common_JNI: GxText_JNI_OnLoad .... done"), bridge, "load log");
+        Check.equal(10L, LOAD_LOG.stream().filter(line -> line.endsWith(", not registered")).count(), "natives left out");
+    }
+
+    // Complete classes: each has the method its framework class here lacks.
+    static final class PaintWithColor extends Paint {
+        public int getColor() { return color; }
+    }
+
+    static final class TextViewWithMaxLines extends TextView {
+        public int getMaxLines() { return maxLines; }
+    }
+
+    static final class LayoutWithLineMax extends Layout {
+        LayoutWithLineMax() { super("\u2588", new float[] {0, 1, 30, -20, 5, 0f, 12f}); }
+
+        public float getLineMax(int line) { return 12f; }
+    }
+
+    static final class FontConfigWithFamilies extends FontConfig {
+        FontConfigWithFamilies(FontConfig.Family... families) { super(families); }
+
+        public FontConfig.Family[] getFamilies() { return families; }
+    }
+
+    /** A 20-pixel BLOCK in DejaVu Sans in a 60 x 50 view, everything set through complete classes. */
+    private static GxText blockText() throws Exception {
+        FontManager.insertFontData("older-sans", Files.readAllBytes(Paths.get(
+                "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf")));
+        GxText text = new GxText();
+        Paint paint = new PaintWithColor();
+        paint.textSize = 20f;
+        TextView view = new TextViewWithMaxLines();
+        view.width = 60;
+        view.height = 50;
+        Check.isTrue(text.GxText_SetFont("older-sans") && text.GxText_SetPaint(paint) && text.GxText_SetView(view)
+                && text.GxText_SetLayout(new LayoutWithLineMax()), "set-up");
+        return text;
+    }
+
+    /** The call's result and log line; it sets no error code (nothing here sets one), and if it fails, nothing changes. */
+    private static void check(GxText text, boolean expected, String line, BooleanSupplier call) {
+        int[] before = text.GxText_RenderTextEffect();
+        boolean[] result = {!expected};
+        List<String> log = LogTap.capture(() -> result[0] = call.getAsBoolean());
+        Check.isTrue(result[0] == expected && log.contains(line), "result " + result[0] + ", log " + log);
+        Check.equal(0, GxError.getLastError(), line + ": error code");
+        Check.isTrue(expected || Arrays.equals(before, text.GxText_RenderTextEffect()), line + ": picture changed");
+    }
+
+    @Test
+    public void aMissingFrameworkMethodFailsOrSkipsItsStepAndChangesNothing() throws Exception {
+        GxText text = blockText();
+        Paint big = new Paint();
+        big.textSize = 40f;
+        check(text, false, "E/GxText_JNI: Java function getColor not found", () -> text.GxText_SetPaint(big));
+        Paint skipped = new PaintWithColor();
+        skipped.textLocales = LocaleList.forLanguageTags("ja");
+        skipped.textAlign = Paint.Align.RIGHT;
+        check(text, true, "D/GxText_JNI: LocaleList cannot find 'toLanguageTags' method id",
+                () -> text.GxText_SetPaint(skipped));
+        check(text, true, "D/GxText_JNI: Paint.Align cannot find 'name' method id", () -> text.GxText_SetPaint(skipped));
+        TextView view = new TextView();
+        view.textColor = 0xFFFF0000;
+        check(text, false, "E/GxText_JNI: GxText_SetView - Function getMaxLines not found",
+                () -> text.GxText_SetView(view));
+        check(text, false, "E/GxText_JNI: GxText_SetLayout - Function getLineMax not found",
+                () -> text.GxText_SetLayout(new Layout("\u2588", new float[] {0, 1, 20, -20, 5, 30f, 12f})));
+        TextView boldItalic = new TextViewWithMaxLines();
+        boldItalic.typeface = Typeface.defaultFromStyle(Typeface.BOLD_ITALIC);
+        check(text, true, "D/GxText_JNI: getTypeFace cannot find 'isItalic' method id",
+                () -> text.GxText_SetView(boldItalic));
+        FontConfig.Family family = new FontConfig.Family("sans-serif", null,
+                new FontConfig.Font("/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf", 400, false, null));
+        check(text, false, "E/Init_GxFontManager_JNI: Java Function getFamilies not found",
+                () -> FontManager.setFontConfig(new FontConfig(family)));
+        check(text, false, "E/Init_GxFontManager_JNI: Java function getFallbackFor not found",
+                () -> FontManager.setFontConfig(new FontConfigWithFamilies(family)));
+        Check.isTrue(FontManager.setFontConfig(new FontConfigWithFamilies(new FontConfig.Family(null, "und-Zsye"))),
+                "nothing was taken: a configuration that can be read still is");
+        text.GxText_finalize();
     }
 
     @Test
     public void theFirstNativesWorkAsBefore() throws Exception {
-        Check.isTrue(FontManager.insertFontData("older-sans", Files.readAllBytes(Paths.get(SANS))), "insert");
-        GxText text = new GxText();
-        Check.isTrue(text.GxText_SetFont("older-sans"), "SetFont");
-        Paint paint = new Paint();
-        paint.setTextSize(20f);
-        Check.isTrue(text.GxText_SetPaint(paint), "SetPaint");
-        TextView view = new TextView();
-        view.setSize(60, 50);
-        view.setMaxLines(1);
-        Check.isTrue(text.GxText_SetView(view), "SetView");
-        Check.isTrue(text.GxText_SetLayout(new Layout("\u2588", 100,
-                new Layout.Line(0, 1, 1, 10, 30, 35, -20, 5, 0f, 12f))), "SetLayout");
+        GxText text = blockText();
         Check.equal(0, text.GxText_AddStrokeTextEffect(3f, 0xFF0000, 1f, 0, 1), "stroke");
         int[] pixels = text.GxText_RenderTextEffect();
         int[] size = text.GxText_GetDrawingBitmapSize();
-        Check.equal(size[0] * size[1], pixels.length, "pixels");
-        int red = 0;
-        int black = 0;
-        for (int p : pixels) {
-            red += p == 0xFFFF0000 ? 1 : 0;
-            black += p == 0xFF000000 ? 1 : 0;
-        }
-        Check.isTrue(red > 20 && black > 20, "a stroked block: " + red + " red, " + black + " black");
-        Check.equal(0, GxError.getLastError(), "no error");
+        long red = Arrays.stream(pixels).filter(p -> p == 0xFFFF0000).count();
+        long black = Arrays.stream(pixels).filter(p -> p == 0xFF000000).count();
+        Check.isTrue(size[0] * size[1] == pixels.length && red > 20 && black > 20,
+                "a stroked block: " + Arrays.toString(size) + ", " + red + " red, " + black + " black pixels");
+        Check.equal(0, GxError.getLastError(), "error code");
         text.GxText_finalize();
     }
 }

@@ -3,215 +3,129 @@ package com.vantrel.android.sdk.gxe;
 import android.graphics.Paint;
 import android.text.Layout;
 import android.widget.TextView;
+import com.vantrel.android.sdk.gxe.util.GxError;
 import java.lang.reflect.Field;
+import java.util.function.Supplier;
+import jvmtest.Check;
 
-/** Shared set-up for the bridge tests: fonts, views, one-line layouts, handles and ink boxes. */
+/** Shared set-up for the bridge tests: views, one-line layouts, texts, handles, ink boxes, fresh threads. */
 final class Fixtures {
     static final String SANS = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf";
-    static final String SERIF = "/usr/share/fonts/truetype/dejavu/DejaVuSerif.ttf";
     /** U+2588 FULL BLOCK: one solid rectangle of ink, so covered pixels are known without the font's outlines. */
     static final String BLOCK = "\u2588";
 
     private Fixtures() {}
 
-    static TextView view(int width, int height) {
-        TextView view = new TextView();
-        view.setSize(width, height);
-        view.setMaxLines(10);
-        return view;
-    }
-
     static Paint paint(float size) {
         Paint paint = new Paint();
-        paint.setTextSize(size);
+        paint.textSize = size;
         return paint;
     }
 
-    /** One line holding all of `text`, its baseline at `baseline`, left edge at `left`. */
-    static Layout line(CharSequence text, int baseline, int ascent, int descent, float left, float width) {
-        return new Layout(text, 1000, new Layout.Line(0, text.length(), text.length(), baseline + ascent,
-                baseline, baseline + descent, ascent, descent, left, width));
+    static TextView view(int width, int height) {
+        TextView view = new TextView();
+        view.width = width;
+        view.height = height;
+        return view;
     }
 
-    /** A text in DejaVu Sans with paint, view and one line of `text` set. */
-    static GxText text(String text, TextView view, float size, int baseline) {
+    /** One line of all of `text`: baseline, ascent (negative) and descent, an em of width a character. */
+    static Layout line(CharSequence text, int baseline, int ascent, int descent, float left) {
+        return new Layout(text, new float[] {0, text.length(), baseline, ascent, descent, left, -ascent * text.length()});
+    }
+
+    /** `text` in DejaVu Sans at `size` pixels in a `width` x `height` view, its baseline at `baseline`. */
+    static GxText text(String text, int width, int height, float size, int baseline) {
         GxText t = new GxText();
-        jvmtest.Check.isTrue(t.GxText_SetFont(SANS), "SetFont");
-        jvmtest.Check.isTrue(t.GxText_SetPaint(paint(size)), "SetPaint");
-        jvmtest.Check.isTrue(t.GxText_SetView(view), "SetView");
-        jvmtest.Check.isTrue(t.GxText_SetLayout(line(text, baseline, -(int) size, (int) (size / 4), 0f,
-                size * text.length())), "SetLayout");
+        Check.isTrue(t.GxText_SetFont(SANS) && t.GxText_SetPaint(paint(size)) && t.GxText_SetView(view(width, height))
+                && t.GxText_SetLayout(line(text, baseline, -(int) size, (int) size / 4, 0f)), "set-up of " + text);
         return t;
     }
 
-    static int handleOf(GxText text) {
-        try {
-            return handleField().getInt(text);
-        } catch (IllegalAccessException e) {
-            throw new AssertionError(e);
-        }
+    /** The 20-pixel BLOCK with its baseline at 30 in a 60 x 50 view. */
+    static GxText block() {
+        return text(BLOCK, 60, 50, 20f, 30);
     }
 
-    static void setHandle(GxText text, int handle) {
-        try {
-            handleField().setInt(text, handle);
-        } catch (IllegalAccessException e) {
-            throw new AssertionError(e);
-        }
-    }
-
-    private static Field handleField() {
-        try {
-            Field f = GxText.class.getDeclaredField("mHandle");
-            f.setAccessible(true);
-            return f;
-        } catch (NoSuchFieldException e) {
-            throw new AssertionError(e);
+    /** Where block() puts ink: {left, top, right, bottom}, from a plain render. */
+    static int[] blockInk() {
+        try (GxText text = block()) {
+            return inkBox(text.render());
         }
     }
 
     /** {left, top, right, bottom} (right and bottom exclusive) of the pixels with any alpha, or null. */
-    static int[] inkBox(int[] pixels, int width, int height) {
-        int left = width, top = height, right = 0, bottom = 0;
-        for (int y = 0; y < height; y++) {
-            for (int x = 0; x < width; x++) {
-                if ((pixels[y * width + x] >>> 24) != 0) {
-                    left = Math.min(left, x);
-                    top = Math.min(top, y);
-                    right = Math.max(right, x + 1);
-                    bottom = Math.max(bottom, y + 1);
-                }
+    static int[] inkBox(int[] pixels, int width) {
+        int left = width, top = -1, right = 0, bottom = 0;
+        for (int i = 0; i < pixels.length; i++) {
+            if ((pixels[i] >>> 24) != 0) {
+                left = Math.min(left, i % width);
+                top = top < 0 ? i / width : top;
+                right = Math.max(right, i % width + 1);
+                bottom = i / width + 1;
             }
         }
-        return right == 0 ? null : new int[] {left, top, right, bottom};
+        return top < 0 ? null : new int[] {left, top, right, bottom};
     }
 
     static int[] inkBox(GxText.Picture p) {
-        return inkBox(p.getPixels(), p.getWidth(), p.getHeight());
+        return inkBox(p.getPixels(), p.getWidth());
     }
 
     /** The pixels of the view's own area of a picture (the effect margins cut off), row by row. */
     static int[] viewPixels(GxText.Picture p, int viewWidth, int viewHeight) {
         int[] pixels = new int[viewWidth * viewHeight];
-        for (int y = 0; y < viewHeight; y++) {
-            for (int x = 0; x < viewWidth; x++) {
-                pixels[y * viewWidth + x] = p.getPixel(x + p.getLeft(), y + p.getTop());
-            }
+        for (int i = 0; i < pixels.length; i++) {
+            pixels[i] = p.getPixel(i % viewWidth + p.getLeft(), i / viewWidth + p.getTop());
         }
         return pixels;
     }
 
-    /**
-     * Where a 20-pixel BLOCK drawn with its pen at (0, 0) puts ink: {left, top, right, bottom}, measured once
-     * from a plain render with the baseline at 30. Placement tests compare against it, so they check where
-     * lines go, not how the rasteriser covers a glyph.
-     */
-    static synchronized int[] blockInk() {
-        if (blockInk == null) {
-            try (GxText t = text(BLOCK, view(60, 50), 20f, 30)) {
-                int[] box = inkBox(t.render());
-                jvmtest.Check.notNull(box, "calibration ink");
-                blockInk = new int[] {box[0], box[1] - 30, box[2], box[3] - 30};
-            }
-        }
-        return blockInk.clone();
+    static int handleOf(GxText text) throws ReflectiveOperationException {
+        Field handle = GxText.class.getDeclaredField("mHandle");
+        handle.setAccessible(true);
+        return handle.getInt(text);
     }
 
-    private static int[] blockInk;
-
-    /** The ink box expected for a 20-pixel BLOCK with its pen at (x, baseline). */
-    static int[] blockAt(int x, int baseline) {
-        int[] ink = blockInk();
-        return new int[] {ink[0] + x, ink[1] + baseline, ink[2] + x, ink[3] + baseline};
-    }
-
-    /** Whether any pixel of rows top..bottom-1 has alpha. */
-    static boolean inkInRows(GxText.Picture p, int top, int bottom) {
-        for (int y = Math.max(0, top); y < Math.min(p.getHeight(), bottom); y++) {
-            for (int x = 0; x < p.getWidth(); x++) {
-                if ((p.getPixel(x, y) >>> 24) != 0) {
-                    return true;
-                }
-            }
-        }
-        return false;
-    }
-
-    /** Whether no native text has this handle (any more). */
-    static boolean isReleased(int handle) {
+    /** Collects garbage until no native text has this handle any more; fails after a few seconds. */
+    static void awaitRelease(int handle) throws Exception {
         GxText probe = new GxText();
-        setHandle(probe, handle);
-        try {
-            return errorAfter(() -> probe.GxText_SetLine(1)) == com.vantrel.android.sdk.gxe.util.GxError.NOT_BOUND;
-        } finally {
-            setHandle(probe, -1);
-            probe.close();
-        }
-    }
-
-    /** Collects garbage until the native text of `handle` is released; fails after a few seconds. */
-    static void awaitRelease(int handle) {
-        for (int round = 0; round < 400; round++) {
-            if (isReleased(handle)) {
-                return;
-            }
+        Field field = GxText.class.getDeclaredField("mHandle");
+        field.setAccessible(true);
+        field.setInt(probe, handle);
+        for (int round = 0; round < 400 && errorAfter(() -> probe.GxText_SetLine(1)) != GxError.NOT_BOUND; round++) {
             System.gc();
-            try {
-                Thread.sleep(10);
-            } catch (InterruptedException e) {
-                throw new AssertionError(e);
-            }
+            Thread.sleep(10);
         }
-        throw new AssertionError("native text " + handle + " was never released");
+        Check.equal(GxError.NOT_BOUND, errorAfter(() -> probe.GxText_SetLine(1)), "native text " + handle + " released");
+        field.setInt(probe, -1);
+        probe.close();
     }
 
-    /** What a call left on a fresh thread: its result, and the thread's reason and error code after it. */
-    static final class Outcome {
-        Object result;
-        String reason;
-        int code;
-
-        /** Checks that the call failed with `expected` as its result, a reason saying `words` and `code`. */
-        void failed(Object expected, String words, int expectedCode, String what) {
-            jvmtest.Check.equal(expected, result, what + " result");
-            jvmtest.Check.isTrue(reason != null && reason.contains(words),
-                    what + ": reason \"" + reason + "\" does not say \"" + words + "\"");
-            jvmtest.Check.equal(expectedCode, code, what + " error code");
-        }
-    }
-
-    static Outcome onFreshThread(java.util.function.Supplier<Object> call) {
-        Outcome outcome = new Outcome();
-        outcome.code = errorAfter(() -> {
-            outcome.result = call.get();
-            outcome.reason = com.vantrel.android.sdk.gxe.util.GxError.getLastReason();
+    /** Runs the call on a fresh thread: it must return `expected`, with a reason saying `words` and no error code. */
+    static void refused(String what, Object expected, String words, Supplier<Object> call) {
+        Object[] out = new Object[2];
+        int code = errorAfter(() -> {
+            out[0] = call.get();
+            out[1] = GxError.getLastReason();
         });
-        return outcome;
+        Check.equal(expected, out[0], what);
+        Check.isTrue(out[1] != null && ((String) out[1]).contains(words), what + ": reason " + out[1] + " lacks " + words);
+        Check.equal(GxError.NONE, code, what + ": error code");
     }
 
-    /** Runs the action on a new thread and returns that thread's error code afterwards. */
+    /** The error code a fresh thread has after running the action. */
     static int errorAfter(Runnable action) {
         int[] code = {-1};
-        Throwable[] thrown = {null};
         Thread thread = new Thread(() -> {
-            try {
-                action.run();
-                code[0] = com.vantrel.android.sdk.gxe.util.GxError.getLastError();
-            } catch (Throwable t) {
-                thrown[0] = t;
-            }
+            action.run();
+            code[0] = GxError.getLastError();
         });
         thread.start();
         try {
             thread.join();
         } catch (InterruptedException e) {
             throw new AssertionError(e);
-        }
-        if (thrown[0] instanceof RuntimeException) {
-            throw (RuntimeException) thrown[0];
-        }
-        if (thrown[0] != null) {
-            throw new AssertionError(thrown[0]);
         }
         return code[0];
     }

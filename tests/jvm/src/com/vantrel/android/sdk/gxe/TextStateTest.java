@@ -1,254 +1,225 @@
 package com.vantrel.android.sdk.gxe;
 
+import android.content.res.AssetManager;
 import android.graphics.Paint;
 import android.graphics.Typeface;
-import android.os.LocaleList;
+import android.text.FontConfig;
 import android.text.Layout;
 import android.text.SpannableString;
 import android.text.style.BackgroundColorSpan;
 import android.widget.TextView;
+import com.vantrel.android.sdk.gxe.font.FontManager;
+import com.vantrel.android.sdk.gxe.util.GxError;
+import java.nio.file.Files;
+import java.nio.file.Path;
+import java.nio.file.Paths;
 import java.util.Arrays;
 import java.util.List;
-import com.vantrel.android.sdk.gxe.util.GxError;
+import java.util.function.BiConsumer;
+import java.util.function.Predicate;
 import jvmtest.Check;
 import jvmtest.LogTap;
 import jvmtest.Test;
 
-/** Paint, view, line limit and layout reaching the native text, seen in what it renders. */
+/** Font, paint, view, line limit and layout reaching the native text, seen in what it renders. */
 public class TextStateTest {
-    private static final int TOP_LEFT = 0x33;
-    private static final int CENTER_VERTICAL_LEFT = 0x13;
-    private static final int BOTTOM_LEFT = 0x53;
-
-    /** Five lines of one BLOCK each, 30 pixels apart, the n-th line's pen at x = 12 n. */
-    private static Layout fiveLines() {
-        Layout.Line[] lines = new Layout.Line[5];
-        for (int i = 0; i < 5; i++) {
-            int baseline = 20 + 30 * i;
-            lines[i] = new Layout.Line(i, i + 1, i + 1, baseline - 20, baseline, baseline + 5, -20, 5, 12f * i, 12f);
-        }
-        return new Layout(Fixtures.BLOCK.repeat(5), 100, lines);
-    }
-
-    private static GxText blockText(TextView view) {
+    /** A 20-pixel text with the view set, no layout yet: in DejaVu Sans, or without a font of its own. */
+    private static GxText blockText(TextView view, boolean font) {
         GxText text = new GxText();
-        Check.isTrue(text.GxText_SetFont(Fixtures.SANS), "SetFont");
-        Check.isTrue(text.GxText_SetPaint(Fixtures.paint(20f)), "SetPaint");
-        Check.isTrue(text.GxText_SetView(view), "SetView");
+        Check.isTrue((!font || text.GxText_SetFont(Fixtures.SANS)) && text.GxText_SetPaint(Fixtures.paint(20f))
+                && text.GxText_SetView(view), "set-up");
         return text;
     }
 
     @Test
-    public void textColourComesFromTheViewNotThePaint() {
+    public void linesShownAndTheirPlacesComeFromTheViewAndTheLineLimit() throws Exception {
+        // The view's width, height, padding (left, top, right, bottom), gravity and maxLines, the line limit;
+        // the first and last line shown (-1: none), and how far their baselines move past the top padding.
+        int[][] cases = {
+            {80, 160, 0, 0, 0, 0, 0x33, 3, 0, 0, 2, 0},
+            {80, 160, 0, 0, 0, 0, 0x33, 3, 1, 0, 0, 0}, // the limit wins over maxLines
+            {80, 160, 0, 0, 0, 0, 0x33, 0, 0, -1, -1, 0}, // neither: no line
+            {60, 50, 5, 7, 3, 2, 0x33, 1, 0, 0, 0, 0}, // padding; the left edge truncated
+            {60, 100, 0, 4, 0, 6, 0x13, 1, 0, 0, 0, 32}, // centred: half the room left, (90 - 25) / 2
+            {80, 100, 0, 0, 0, 3, 0x53, 9, 2, 3, 4, -48}, // bottom: the last lines, the last on the padding
+        };
+        // Five lines of one BLOCK each, 30 pixels apart, the n-th line's left edge at 12 n + 0.9.
+        float[][] lines = new float[5][];
+        for (int i = 0; i < 5; i++) {
+            lines[i] = new float[] {i, i + 1, 20 + 30 * i, -20, 5, 12f * i + 0.9f, 12f};
+        }
+        // Where a BLOCK with its pen at (0, 0) puts ink: these are checks of where lines go, not of the rasteriser.
+        int[] ink = Fixtures.blockInk();
+        for (int[] c : cases) {
+            TextView view = Fixtures.view(c[0], c[1]);
+            view.paddingLeft = c[2];
+            view.paddingTop = c[3];
+            view.paddingRight = c[4];
+            view.paddingBottom = c[5];
+            view.gravity = c[6];
+            view.maxLines = c[7];
+            try (GxText text = blockText(view, true)) {
+                Check.isTrue(text.GxText_SetLine(c[8]) && text.GxText_SetLayout(new Layout("\u2588".repeat(5), lines)),
+                        "set-up");
+                GxText.Picture p = text.render();
+                String what = "view and limit " + Arrays.toString(Arrays.copyOf(c, 9));
+                Check.equal(new int[] {c[0], c[1]}, new int[] {p.getWidth(), p.getHeight()}, what + ": picture size");
+                int[] expected = c[9] < 0 ? null : new int[] {ink[0] + c[2] + 12 * c[9], ink[1] - 10 + c[3] + 30 * c[9]
+                    + c[11], ink[2] + c[2] + 12 * c[10], ink[3] - 10 + c[3] + 30 * c[10] + c[11]};
+                Check.equal(Arrays.toString(expected), Arrays.toString(Fixtures.inkBox(p)), what + ": ink");
+            }
+        }
+    }
+
+    @Test
+    public void theColourIsTheViewsAndTheBackgroundTheLastSpans() {
         TextView view = Fixtures.view(60, 50);
-        view.setTextColor(0xFF2040C0);
+        view.textColor = 0xFF2040C0;
         Paint paint = Fixtures.paint(20f);
-        paint.setColor(0xFFFF0000);
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetPaint(paint), "SetPaint");
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f, 12f)), "SetLayout");
-            GxText.Picture picture = text.render();
-            Check.pixel(0xFF2040C0, picture.getPixel(7, 25), "inside the block");
-            Check.pixel(0, picture.getPixel(40, 25), "beside it");
-        }
-    }
-
-    @Test
-    public void paddingMovesTheLinesAndTheBitmapKeepsTheViewSize() {
-        TextView view = Fixtures.view(60, 50);
-        view.setPadding(5, 7, 3, 2);
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 2.9f, 12f)), "SetLayout");
-            GxText.Picture picture = text.render();
-            Check.equal(new int[] {60, 50}, new int[] {picture.getWidth(), picture.getHeight()}, "size");
-            // x = paddingLeft + the line's left truncated; y = paddingTop + baseline.
-            Check.equal(Fixtures.blockAt(5 + 2, 7 + 30), Fixtures.inkBox(picture), "ink");
-        }
-    }
-
-    @Test
-    public void centreGravityMovesTheFirstBaselineByHalfTheRoomLeft() {
-        TextView view = Fixtures.view(60, 100);
-        view.setGravity(CENTER_VERTICAL_LEFT);
-        view.setPadding(0, 4, 0, 6);
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 20, -20, 5, 0f, 12f)), "SetLayout");
-            // Room: 100 - 4 - 6 = 90 against a line bottom of 25: down by (90 - 25) / 2 = 32.
-            Check.equal(Fixtures.blockAt(0, 4 + 20 + 32), Fixtures.inkBox(text.render()), "ink");
-        }
-    }
-
-    @Test
-    public void bottomGravityShowsTheLastLinesUpToTheLimit() {
-        TextView view = Fixtures.view(80, 100);
-        view.setGravity(BOTTOM_LEFT);
-        view.setPadding(0, 0, 0, 3);
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetLine(2), "SetLine");
-            Check.isTrue(text.GxText_SetLayout(fiveLines()), "SetLayout");
-            GxText.Picture picture = text.render();
-            // Lines 3 and 4: the last line's bottom sits on the padding, 100 - 3 - (145 - 140) = 92.
-            int[] line3 = Fixtures.blockAt(36, 62);
-            int[] line4 = Fixtures.blockAt(48, 92);
-            Check.equal(new int[] {line3[0], line3[1], line4[2], line4[3]}, Fixtures.inkBox(picture), "ink");
-            Check.isTrue(!Fixtures.inkInRows(picture, line3[3], line4[1]), "gap between the two lines");
-            Check.pixel(0, picture.getPixel(line4[0] + 6, line3[1] + 6), "line 4's column beside line 3");
-        }
-    }
-
-    @Test
-    public void lineLimitWinsOverMaxLinesAndNeitherShowsNothing() {
-        TextView view = Fixtures.view(80, 160);
-        view.setMaxLines(3);
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetLayout(fiveLines()), "SetLayout");
-            int[] third = Fixtures.blockAt(24, 80);
-            Check.equal(new int[] {0, Fixtures.blockAt(0, 20)[1], third[2], third[3]},
-                    Fixtures.inkBox(text.render()), "three lines by maxLines");
-
-            Check.isTrue(text.GxText_SetLine(1), "SetLine");
-            Check.isTrue(text.GxText_SetLayout(fiveLines()), "SetLayout");
-            Check.equal(Fixtures.blockAt(0, 20), Fixtures.inkBox(text.render()), "one line by the limit");
-        }
-        view.setMaxLines(0);
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetLayout(fiveLines()), "SetLayout");
-            Check.isNull(Fixtures.inkBox(text.render()), "no limit and no maxLines");
-        }
-    }
-
-    @Test
-    public void aTextHoldingU0000FailsTheLayoutAndChangesNothing() {
-        try (GxText text = blockText(Fixtures.view(60, 50))) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f, 12f)), "SetLayout");
-            int[] before = text.render().getPixels();
-            String nul = Fixtures.BLOCK + "\u0000" + Fixtures.BLOCK;
-            Check.isTrue(!text.GxText_SetLayout(Fixtures.line(nul, 40, -20, 5, 20f, 36f)), "refused");
-            Check.isTrue(GxError.getLastReason().contains("U+0000"), "reason: " + GxError.getLastReason());
-            Check.equal(before, text.render().getPixels(), "the old text and lines are kept");
-        }
-    }
-
-    @Test
-    public void backgroundIsTheLastSpansColourOverTheLineBox() {
+        paint.color = 0xFFFF0000;
         SpannableString spanned = new SpannableString(Fixtures.BLOCK);
         spanned.setSpan(new BackgroundColorSpan(0xFF00FF00), 0, 1, 0);
-        spanned.setSpan(new BackgroundColorSpan(0xFFFF0000), 0, 1, 0);
-        try (GxText text = blockText(Fixtures.view(60, 50))) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(spanned, 40, -38, 8, 0f, 12f)), "SetLayout");
-            GxText.Picture picture = text.render();
-            Check.pixel(0xFFFF0000, picture.getPixel(6, 4), "box above the glyph");
-            Check.pixel(0xFFFF0000, picture.getPixel(6, 47), "box below the glyph");
-            Check.pixel(0xFF000000, picture.getPixel(6, 30), "glyph over the box");
-            Check.pixel(0, picture.getPixel(40, 30), "outside the box");
-        }
-        try (GxText text = blockText(Fixtures.view(60, 50))) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 40, -38, 8, 0f, 12f)), "SetLayout");
-            Check.pixel(0, text.render().getPixel(6, 4), "no span, no box");
+        spanned.setSpan(new BackgroundColorSpan(0xFFFFD000), 0, 1, 0);
+        try (GxText text = blockText(view, true)) {
+            Check.isTrue(text.GxText_SetPaint(paint) && text.GxText_SetLayout(Fixtures.line(spanned, 40, -38, 8, 0f)),
+                    "set-up");
+            GxText.Picture p = text.render();
+            Check.pixel(0xFF2040C0, p.getPixel(6, 30), "the glyph, over the box");
+            Check.pixel(0xFFFFD000, p.getPixel(6, 4), "the box above the glyph");
+            Check.pixel(0xFFFFD000, p.getPixel(6, 47), "the box below the glyph");
+            Check.pixel(0, p.getPixel(50, 30), "beside the box");
         }
     }
 
     @Test
-    public void paintSizeScaleAndSpacingReachTheGlyphs() {
-        int[] base = Fixtures.blockInk();
-        try (GxText text = blockText(Fixtures.view(200, 100))) {
-            Paint paint = Fixtures.paint(40f);
-            Check.isTrue(text.GxText_SetPaint(paint), "SetPaint");
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 60, -45, 10, 0f, 40f)), "SetLayout");
-            int[] big = Fixtures.inkBox(text.render());
-            int height = base[3] - base[1];
-            Check.isTrue(Math.abs((big[3] - big[1]) - 2 * height) <= 2, "twice the size: " + Arrays.toString(big));
-
-            paint.setTextScaleX(2f);
-            Check.isTrue(text.GxText_SetPaint(paint), "SetPaint");
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 60, -45, 10, 0f, 40f)), "SetLayout");
-            int[] wide = Fixtures.inkBox(text.render());
-            Check.isTrue(Math.abs((wide[2] - wide[0]) - 2 * (big[2] - big[0])) <= 2,
-                    "twice as wide: " + Arrays.toString(wide) + " vs " + Arrays.toString(big));
-        }
-        try (GxText text = blockText(Fixtures.view(200, 100))) {
-            String two = Fixtures.BLOCK + Fixtures.BLOCK;
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(two, 40, -20, 5, 0f, 40f)), "SetLayout");
-            int[] tight = Fixtures.inkBox(text.render());
-            Paint spaced = Fixtures.paint(20f);
-            spaced.setLetterSpacing(0.5f);
-            spaced.setTextLocales(LocaleList.forLanguageTags("en-US"));
-            spaced.setFontFeatureSettings("'liga' 0");
-            spaced.setTextAlign(Paint.Align.CENTER);
-            Check.isTrue(text.GxText_SetPaint(spaced), "SetPaint");
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(two, 40, -20, 5, 0f, 40f)), "SetLayout");
-            int[] loose = Fixtures.inkBox(text.render());
-            // Half an em (10 pixels) more between the two blocks.
-            Check.isTrue((loose[2] - loose[0]) - (tight[2] - tight[0]) >= 10,
-                    "letter spacing: " + Arrays.toString(loose) + " vs " + Arrays.toString(tight));
+    public void everyPaintAndViewSettingReachesTheGlyphs() {
+        List<BiConsumer<Paint, TextView>> settings = Arrays.asList((p, v) -> p.textSize = 24f,
+                (p, v) -> p.textScaleX = 1.5f, (p, v) -> p.textSkewX = -0.25f, (p, v) -> p.letterSpacing = 0.5f,
+                (p, v) -> p.flags |= Paint.FAKE_BOLD_TEXT_FLAG, (p, v) -> p.flags = 0,
+                (p, v) -> v.textColor = 0xFF808080,
+                (p, v) -> v.typeface = Typeface.defaultFromStyle(Typeface.ITALIC));
+        int[] plain = null;
+        for (int i = 0; i < settings.size(); i++) {
+            try (GxText text = Fixtures.text("Hx", 100, 50, 20f, 30)) {
+                plain = plain != null ? plain : text.render().getPixels();
+                Paint paint = Fixtures.paint(20f);
+                TextView view = Fixtures.view(100, 50);
+                settings.get(i).accept(paint, view);
+                Check.isTrue(text.GxText_SetPaint(paint) && text.GxText_SetView(view)
+                        && text.GxText_SetLayout(Fixtures.line("Hx", 30, -20, 5, 0f)), "set-up");
+                int[] changed = text.render().getPixels();
+                Check.isTrue(!Arrays.equals(plain, changed), "setting " + i + " does not change the picture");
+                view.typeface = null; // a view without a typeface keeps the style it had
+                Check.isTrue(text.GxText_SetView(view), "SetView");
+                Check.equal(changed, text.render().getPixels(), "setting " + i + ", then a view without typeface");
+            }
         }
     }
 
     @Test
-    public void viewWithoutTypefaceKeepsTheStyleBits() {
-        TextView view = Fixtures.view(60, 50);
-        Layout layout = Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f, 12f);
-        int[] upright;
-        int[] italic;
-        try (GxText text = blockText(view)) {
-            Check.isTrue(text.GxText_SetLayout(layout), "SetLayout");
-            upright = text.render().getPixels();
-            view.setTypeface(Typeface.defaultFromStyle(Typeface.ITALIC));
-            Check.isTrue(text.GxText_SetView(view), "SetView italic");
-            italic = text.render().getPixels();
-            Check.isTrue(!Arrays.equals(upright, italic), "italic draws slanted");
-            view.setTypeface(null);
-            Check.isTrue(text.GxText_SetView(view), "SetView without typeface");
-            Check.equal(italic, text.render().getPixels(), "still italic");
-            view.setTypeface(Typeface.defaultFromStyle(Typeface.NORMAL));
-            Check.isTrue(text.GxText_SetView(view), "SetView normal");
-            Check.equal(upright, text.render().getPixels(), "upright again");
-        }
-    }
-
-    @Test
-    public void nullArgumentsAreRefused() {
-        try (GxText text = blockText(Fixtures.view(60, 50))) {
-            int handle = Fixtures.handleOf(text);
-            List<String> log = LogTap.capture(() -> Check.isTrue(!text.GxText_SetLayout(null), "SetLayout(null)"));
-            Check.isTrue(LogTap.contains(log, 'D', "GxText_JNI", "GxText_SetLayout - RH(" + handle + ") null"),
-                    "log " + log);
-            Check.isTrue(!text.GxText_SetPaint(null), "SetPaint(null)");
-            Check.isTrue(!text.GxText_SetView(null), "SetView(null)");
-        }
-    }
-
-    /** A layout whose line widths cannot be read. */
-    private static final class BrokenLayout extends Layout {
-        BrokenLayout(CharSequence text) {
-            super(text, 100, new Layout.Line(0, 1, 1, 0, 20, 25, -20, 5, 0f, 12f));
-        }
-
-        @Override
-        public float getLineWidth(int line) {
-            throw new IllegalStateException("no widths today");
-        }
-    }
-
-    @Test
-    public void layoutThatThrowsChangesNothingAndLeavesNoException() {
-        try (GxText text = blockText(Fixtures.view(60, 50))) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f, 12f)), "SetLayout");
+    public void refusedArgumentsChangeNothing() throws Exception {
+        try (GxText text = blockText(Fixtures.view(60, 50), true)) {
+            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f)), "SetLayout");
             int[] before = text.render().getPixels();
-            List<String> log = LogTap.capture(
-                    () -> Check.isTrue(!text.GxText_SetLayout(new BrokenLayout("x")), "SetLayout(broken)"));
-            Check.isTrue(LogTap.contains(log, 'E', "GxText_JNI", "GxText_SetLayout - Java exception"), "log " + log);
-            Check.equal(before, text.render().getPixels(), "same picture");
+            Layout broken = new Layout("x", new float[] {0, 1, 20, -20, 5, 0f, 12f}) {
+                @Override
+                public float getLineWidth(int line) {
+                    throw new IllegalStateException("no widths today");
+                }
+            };
+            String nul = Fixtures.BLOCK + "\u0000" + Fixtures.BLOCK;
+            List<String> log = LogTap.capture(() -> Check.isTrue(!text.GxText_SetPaint(null)
+                    && !text.GxText_SetView(null) && !text.GxText_SetLayout(null) && !text.GxText_SetLayout(broken)
+                    && !text.GxText_SetLayout(Fixtures.line(nul, 40, -20, 5, 20f)), "refused"));
+            String reason = GxError.getLastReason();
+            Check.isTrue(reason != null && reason.contains("U+0000"), "reason for U+0000: " + reason);
+            for (String line : new String[] {"E/GxText_JNI: GxText_SetPaint - paint is NULL",
+                    "E/GxText_JNI: GxText_SetView - view is NULL", "E/GxText_JNI: GxText_SetLayout - Java exception",
+                    "D/GxText_JNI: GxText_SetLayout - RH(" + Fixtures.handleOf(text) + ") null"}) {
+                Check.isTrue(log.contains(line), "no log line \"" + line + "\" in " + log);
+            }
+            Check.equal(before, text.render().getPixels(), "the picture after refused calls");
+            // A text of characters that are not UTF-16 pairs still makes the trip (U+0000 does not).
+            Check.isTrue(text.GxText_SetLayout(Fixtures.line("\uD800x", 30, -20, 5, 0f)), "a lone surrogate");
+        }
+    }
+
+    /** A 20-pixel BLOCK without a font of its own. */
+    private static GxText withoutFont() {
+        GxText text = blockText(Fixtures.view(60, 50), false);
+        Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f)), "SetLayout");
+        return text;
+    }
+
+    /** Whether the text draws its BLOCK where DejaVu Sans draws it. */
+    private static boolean drawsBlock(GxText text) {
+        return Arrays.equals(Fixtures.blockInk(), Fixtures.inkBox(text.render()));
+    }
+
+    @Test
+    public void fontsThatCannotBeUsedSayWhyAndTheOthersDraw() throws Exception {
+        Path root = Files.createTempDirectory("gxe-assets");
+        Files.copy(Paths.get(Fixtures.SANS), root.resolve("Asset Sans.ttf"));
+        AssetManager assets = new AssetManager(root.toString());
+        byte[] sans = Files.readAllBytes(Paths.get(Fixtures.SANS));
+        try (GxText text = withoutFont()) {
+            List<String> log = LogTap.capture(() -> {
+                Fixtures.refused("null path", false, "no font path", () -> text.setFont((String) null));
+                Fixtures.refused("null name", false, "no font name", () -> text.setFont(null, new byte[1]));
+                Fixtures.refused("null bytes", false, "no font bytes", () -> text.setFont("by-bytes", null));
+                Fixtures.refused("garbage bytes", false, "garbage: not a font", () -> text.setFont("garbage", new byte[] {1, 2, 3}));
+                Fixtures.refused("null assets", false, "no asset manager", () -> text.setFont((AssetManager) null, "x.ttf"));
+                Fixtures.refused("null asset name", false, "no asset name", () -> text.setFont(assets, null));
+                Fixtures.refused("missing asset", false, "missing.ttf: no such asset", () -> text.setFont(assets, "missing.ttf"));
+                Fixtures.refused("inserted without name", false, "no font name", () -> FontManager.insertFontData(null, new byte[1]));
+                Fixtures.refused("inserted without bytes", false, "no font bytes", () -> FontManager.insertFontData("x", null));
+                Fixtures.refused("inserted empty", false, "no-bytes: no font bytes", () -> FontManager.insertFontData("no-bytes", new byte[0]));
+                Fixtures.refused("no configuration", false, "no font configuration", () -> FontManager.setFontConfig(null));
+            });
+            for (String line : new String[] {"GxText_JNI: GxText_SetFont() - Fail to get fontFile string",
+                    "GxText_JNI: GxText_SetFont2() - fontName is NULL", "GxText_JNI: GxText_SetFont2() - buffer is NULL",
+                    "GxText_JNI: GxText_SetFont3() - assetManager is NULL", "GxText_JNI: GxText_SetFont3() - fontName is NULL",
+                    "GxText_JNI: GxText_SetFont3() - _ASSET_NOT_FOUND_",
+                    "Init_GxFontManager_JNI: GxFontManager_InsertFontData() - fontName is NULL",
+                    "Init_GxFontManager_JNI: GxFontManager_InsertFontData() - buffer is NULL",
+                    "Init_GxFontManager_JNI: GxFontManager_SetFontConfig - jFontConfig is NULL"}) {
+                Check.isTrue(log.contains("E/" + line), "no log line \"E/" + line + "\" in " + log);
+            }
+            Check.isTrue(Fixtures.inkBox(text.render()) == null, "a text without a font draws nothing");
+            // A call that works clears the reason.
+            Check.isTrue(text.setFont(assets, "Asset Sans.ttf") && GxError.getLastReason() == null, "asset font");
+            Check.isTrue(drawsBlock(text), "draws with the asset");
+        } finally {
+            Files.delete(root.resolve("Asset Sans.ttf"));
+            Files.delete(root);
+        }
+        Check.isTrue(FontManager.insertFontData("inserted", sans), "inserted");
+        Check.isTrue(FontManager.insertFontData("inserted", new byte[] {9}), "inserted again: the first is kept");
+        List<Predicate<GxText>> ways = Arrays.asList(t -> t.setFont(Fixtures.SANS), t -> t.setFont("by-bytes", sans),
+                t -> t.setFont("inserted"), t -> t.setFont(new AssetManager("/nonexistent"), "inserted"));
+        for (int i = 0; i < ways.size(); i++) {
+            try (GxText text = withoutFont()) {
+                Check.isTrue(ways.get(i).test(text) && drawsBlock(text), "font " + i + " does not draw");
+            }
         }
     }
 
     @Test
-    public void layoutWithoutLinesDrawsNothing() {
-        try (GxText text = blockText(Fixtures.view(60, 50))) {
-            Check.isTrue(text.GxText_SetLayout(new Layout(Fixtures.BLOCK, 100)), "SetLayout");
-            Check.isNull(Fixtures.inkBox(text.render()), "ink");
-            // A text of characters that are not UTF-16 pairs still makes the trip (U+0000 does not: below).
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line("\uD800x", 30, -20, 5, 0f, 12f)), "SetLayout");
+    public void systemFamiliesAreTakenOncePerProcess() {
+        FontConfig.Font upright = new FontConfig.Font(Fixtures.SANS, 400, false, null);
+        FontConfig.Family laterNamed = new FontConfig.Family("serif", null, upright) {
+            @Override
+            public FontConfig.Font[] getFonts() {
+                throw new IllegalStateException("the fonts of a later named family are read");
+            }
+        };
+        Check.isTrue(FontManager.setFontConfig(new FontConfig(new FontConfig.Family("sans-serif", null,
+                new FontConfig.Font(Fixtures.SANS.replace(".ttf", "-Oblique.ttf"), 400, true, null), upright), null,
+                laterNamed, new FontConfig.Family(null, "und-Arab", new FontConfig.Font("/nonexistent.ttf", 400, false,
+                null), null))), "the first configuration, without reading a later named family's fonts");
+        try (GxText text = withoutFont()) {
+            Check.isTrue(drawsBlock(text), "the named family's upright font draws");
         }
+        Check.isTrue(FontManager.setFontConfig(null), "once set, a configuration is not even looked at");
     }
 }

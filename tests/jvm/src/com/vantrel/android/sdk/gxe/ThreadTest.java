@@ -3,7 +3,6 @@ package com.vantrel.android.sdk.gxe;
 import android.text.FontConfig;
 import com.vantrel.android.sdk.gxe.effect.Stroke;
 import com.vantrel.android.sdk.gxe.font.FontManager;
-import java.io.IOException;
 import java.nio.file.Files;
 import java.nio.file.Paths;
 import java.util.ArrayList;
@@ -24,7 +23,6 @@ import jvmtest.Test;
 public class ThreadTest {
     private static final int THREADS = 8;
     private static final int TEXTS_PER_THREAD = 30;
-    private static final String DEJAVU = "/usr/share/fonts/truetype/dejavu/";
     private static final String[] LOCALES = {
         "und-Arab", "und-Grek", "und-Cyrl", "und-Hebr", "und-Thai", "und-Deva", "ja", "ko", "zh-Hans", "zh-Hant"};
     /** Texts whose scripts need the families of the locales above. */
@@ -39,11 +37,11 @@ public class ThreadTest {
             {"DejaVuSerif.ttf", "DejaVuSerif-Bold.ttf", "DejaVuSerifCondensed.ttf"},
             {"DejaVuSansMono.ttf", "DejaVuSansMono-Bold.ttf", "DejaVuSansCondensed.ttf"}};
         List<FontConfig.Family> families = new ArrayList<>();
-        families.add(new FontConfig.Family("sans-serif", null, 0, font("DejaVuSans.ttf", 400),
+        families.add(new FontConfig.Family("sans-serif", null, font("DejaVuSans.ttf", 400),
                 font("DejaVuSans-Bold.ttf", 700), font("DejaVuSerif.ttf", 500)));
         for (String locale : LOCALES) {
             for (String[] set : sets) {
-                families.add(new FontConfig.Family(null, locale, 0, font(set[0], 400), font(set[1], 700),
+                families.add(new FontConfig.Family(null, locale, font(set[0], 400), font(set[1], 700),
                         font(set[2], 300)));
             }
         }
@@ -51,15 +49,13 @@ public class ThreadTest {
     }
 
     private static FontConfig.Font font(String file, int weight) {
-        return new FontConfig.Font(DEJAVU + file, 0, weight, false, null);
+        return new FontConfig.Font("/usr/share/fonts/truetype/dejavu/" + file, weight, false, null);
     }
 
     private static GxText strokedBlock(String font) {
         GxText text = new GxText();
-        Check.isTrue(text.setFont(font), "font " + font);
-        Check.isTrue(text.setPaint(Fixtures.paint(20f)), "paint");
-        Check.isTrue(text.setView(Fixtures.view(40, 40)), "view");
-        Check.isTrue(text.setLayout(Fixtures.line(Fixtures.BLOCK, 28, -20, 5, 2f, 12f)), "layout");
+        Check.isTrue(text.setFont(font) && text.setPaint(Fixtures.paint(20f)) && text.setView(Fixtures.view(40, 40))
+                && text.setLayout(Fixtures.line(Fixtures.BLOCK, 28, -20, 5, 2f)), "set-up with " + font);
         Check.equal(0, text.addStroke(new Stroke().size(2).color(0xFF0000)), "stroke");
         return text;
     }
@@ -87,14 +83,11 @@ public class ThreadTest {
                     Check.isTrue(FontManager.insertFontData(ownFont, sans.clone()), "insert");
                     for (int i = 0; i < TEXTS_PER_THREAD; i++) {
                         GxText text = strokedBlock(i % 2 == 0 ? ownFont : Fixtures.SANS);
-                        int[] pixels = text.render().getPixels();
-                        if (!Arrays.equals(reference, pixels)) {
-                            throw new AssertionError("picture differs from the reference");
-                        }
+                        Check.isTrue(Arrays.equals(reference, text.render().getPixels()), "picture differs");
                         // A script the text's font lacks: its families load on first need.
                         String script = SCRIPTS[(i + seed) % SCRIPTS.length];
-                        Check.isTrue(text.setLayout(Fixtures.line(script, 28, -20, 5, 2f, 30f)), "layout");
-                        Check.notNull(text.render(), "script picture");
+                        Check.isTrue(text.setLayout(Fixtures.line(script, 28, -20, 5, 2f))
+                                && text.render() != null, "a picture of " + script);
                         handles.add(Fixtures.handleOf(text));
                         if (i % 2 == 0) {
                             text.close();
@@ -113,10 +106,8 @@ public class ThreadTest {
         if (!failures.isEmpty()) {
             throw new AssertionError("a thread failed", failures.peek());
         }
-
         Set<Integer> distinct = new HashSet<>(handles);
         Check.equal(THREADS * TEXTS_PER_THREAD, distinct.size(), "distinct handles");
-
         // Every native text goes: closed ones at once, dropped ones once the collector found them.
         for (int handle : distinct) {
             Fixtures.awaitRelease(handle);

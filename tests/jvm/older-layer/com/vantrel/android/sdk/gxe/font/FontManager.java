@@ -13,4 +13,8 @@ public final class FontManager {
     public static boolean insertFontData(String name, byte[] data) {
         return GxFontManager_InsertFontData(name, data);
     }
+
+    public static boolean setFontConfig(FontConfig config) {
+        return GxFontManager_SetFontConfig(config);
+    }
 }
