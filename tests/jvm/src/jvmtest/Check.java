@@ -13,7 +13,7 @@ public final class Check {
         }
     }
 
-    /** Values, or int arrays (ink boxes; whole pictures, of which the first differing pixel is named). */
+    /** Values, or int arrays: short ones are shown whole, of whole pictures the first differing pixel. */
     public static void equal(Object expected, Object actual, String what) {
         if (!(expected instanceof int[] && actual instanceof int[])) {
             isTrue(Objects.equals(expected, actual), what + ": expected " + expected + ", got " + actual);
@@ -21,14 +21,12 @@ public final class Check {
         }
         int[] e = (int[]) expected, a = (int[]) actual;
         int i = Arrays.mismatch(e, a);
-        if (i < 0) {
-            return;
-        } else if (e.length <= 4 && a.length <= 4) {
+        if (i >= 0 && e.length <= 4 && a.length <= 4) {
             throw new AssertionError(what + ": expected " + Arrays.toString(e) + ", got " + Arrays.toString(a));
-        } else if (i >= Math.min(e.length, a.length)) {
-            throw new AssertionError(what + ": expected " + e.length + " values, got " + a.length);
+        } else if (i >= 0) {
+            isTrue(i < Math.min(e.length, a.length), what + ": expected " + e.length + " values, got " + a.length);
+            throw new AssertionError(String.format("%s: value %d is %08X, expected %08X", what, i, a[i], e[i]));
         }
-        throw new AssertionError(String.format("%s: value %d is %08X, expected %08X", what, i, a[i], e[i]));
     }
 
     /** Two 0xAARRGGBB pixels. */

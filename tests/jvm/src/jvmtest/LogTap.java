@@ -2,8 +2,6 @@ package jvmtest;
 
 import static java.nio.charset.StandardCharsets.UTF_8;
 
-import java.io.IOException;
-import java.io.UncheckedIOException;
 import java.nio.file.Files;
 import java.nio.file.Path;
 import java.util.ArrayList;
@@ -22,6 +20,7 @@ public final class LogTap {
 
     private LogTap() {}
 
+    /** Sends stderr to the file at `path`, or back when `path` is null. */
     private static native void redirect(String path);
 
     /** Runs the action; returns the lines written to stderr meanwhile. */
@@ -37,12 +36,11 @@ public final class LogTap {
             }
             List<String> lines = new ArrayList<>(Arrays.asList(new String(Files.readAllBytes(file), UTF_8).split("\n")));
             Files.delete(file);
-            lines.remove("");
             // Anything the JVM itself said goes on to the real stderr.
             lines.stream().filter(line -> !line.matches("^[DIWE?]/.*")).forEach(System.err::println);
             return lines;
-        } catch (IOException e) {
-            throw new UncheckedIOException(e);
+        } catch (java.io.IOException e) {
+            throw new AssertionError(e);
         }
     }
 

