@@ -10,7 +10,7 @@ import java.util.function.Supplier;
 import jvmtest.Check;
 import jvmtest.LogTap;
 
-/** Shared set-up for the bridge tests: views, one-line layouts, texts, handles, ink boxes, fresh threads. */
+/** Shared set-up for the bridge tests: texts, one-line layouts, handles, ink boxes, calls on fresh threads. */
 final class Fixtures {
     static final String SANS = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf";
     /** U+2588 FULL BLOCK: one solid rectangle of ink, so covered pixels are known without the font's outlines. */
@@ -32,20 +32,20 @@ final class Fixtures {
     }
 
     /** One line of all of `text`: baseline, ascent (negative) and descent, an em of width a character. */
-    static Layout line(CharSequence text, int baseline, int ascent, int descent, float left) {
-        return new Layout(text, new float[] {0, text.length(), baseline, ascent, descent, left, -ascent * text.length()});
+    static Layout line(CharSequence text, int baseline, int ascent, int descent) {
+        return new Layout(text, new float[] {0, text.length(), baseline, ascent, descent, 0f, -ascent * text.length()});
     }
 
-    /** `text` in DejaVu Sans (or without a font) at `size` pixels in a `width` x `height` view, baseline at 4/5. */
+    /** `text` in `font` (null: none) at `size` pixels in a `width` x `height` view, the baseline at 4/5. */
     static GxText text(String font, String text, int width, int height, float size) {
         GxText t = new GxText();
         Check.isTrue((font == null || t.GxText_SetFont(font)) && t.GxText_SetPaint(paint(size))
                 && t.GxText_SetView(view(width, height))
-                && t.GxText_SetLayout(line(text, height * 4 / 5, -(int) size, (int) size / 4, 0f)), "set-up");
+                && t.GxText_SetLayout(line(text, height * 4 / 5, -(int) size, (int) size / 4)), "set-up");
         return t;
     }
 
-    /** The 20-pixel BLOCK with its baseline at 40 in a 60 x 50 view. */
+    /** The 20-pixel BLOCK in DejaVu Sans with its baseline at 40 in a 60 x 50 view. */
     static GxText block() {
         return text(SANS, BLOCK, 60, 50, 20f);
     }
@@ -86,24 +86,23 @@ final class Fixtures {
         return pixels;
     }
 
-    static int handleOf(GxText text) throws ReflectiveOperationException {
+    /** The field the natives keep a text's handle in. */
+    static Field handle() throws NoSuchFieldException {
         Field handle = GxText.class.getDeclaredField("mHandle");
         handle.setAccessible(true);
-        return handle.getInt(text);
+        return handle;
     }
 
     /** Collects garbage until no native text has this handle any more; fails after a few seconds. */
     static void awaitRelease(int handle) throws Exception {
         GxText probe = new GxText();
-        Field field = GxText.class.getDeclaredField("mHandle");
-        field.setAccessible(true);
-        field.setInt(probe, handle);
+        handle().setInt(probe, handle);
         for (int round = 0; round < 400 && errorAfter(() -> probe.GxText_SetLine(1)) != GxError.NOT_BOUND; round++) {
             System.gc();
             Thread.sleep(10);
         }
         Check.equal(GxError.NOT_BOUND, errorAfter(() -> probe.GxText_SetLine(1)), "native text " + handle + " released");
-        field.setInt(probe, -1);
+        handle().setInt(probe, -1);
         probe.close();
     }
 

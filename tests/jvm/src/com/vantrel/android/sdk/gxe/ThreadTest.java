@@ -3,15 +3,9 @@ package com.vantrel.android.sdk.gxe;
 import android.text.FontConfig;
 import com.vantrel.android.sdk.gxe.effect.Stroke;
 import com.vantrel.android.sdk.gxe.font.FontManager;
-import java.nio.file.Files;
-import java.nio.file.Paths;
-import java.util.ArrayList;
-import java.util.Arrays;
-import java.util.List;
-import java.util.Set;
-import java.util.concurrent.ConcurrentHashMap;
-import java.util.concurrent.ConcurrentLinkedQueue;
-import java.util.concurrent.CountDownLatch;
+import java.nio.file.*;
+import java.util.*;
+import java.util.concurrent.*;
 import jvmtest.Check;
 
 /**
@@ -34,29 +28,38 @@ public class ThreadTest {
     private static GxText strokedBlock(String font) {
         GxText text = new GxText();
         Check.isTrue(text.setFont(font) && text.setPaint(Fixtures.paint(20f)) && text.setView(Fixtures.view(40, 40))
-                && text.setLayout(Fixtures.line(Fixtures.BLOCK, 28, -20, 5, 2f))
+                && text.setLayout(Fixtures.line(Fixtures.BLOCK, 28, -20, 5))
                 && text.addStroke(new Stroke().size(2).color(0xFF0000)) == 0, "set-up with " + font);
         return text;
     }
 
     public void textsOnManyThreadsRenderAlikeAndAreAllReleased() throws Exception {
-        // A default family and three families of three fonts for each locale: 31 in all.
-        List<FontConfig.Family> families = new ArrayList<>();
-        families.add(new FontConfig.Family("sans-serif", null, font("Sans", 400), font("Sans-Bold", 700)));
+        // A default family, an oblique font before its upright one, then a later named family (dropped before
+        // its fonts are read) and three families of three fonts for each locale.
+        List<FontConfig.Family> families = new ArrayList<>(Arrays.asList(new FontConfig.Family("sans-serif", null,
+                new FontConfig.Font(Fixtures.SANS.replace(".ttf", "-Oblique.ttf"), 400, true, null), font("Sans", 400)),
+                new FontConfig.Family("serif", null) {
+                    @Override
+                    public FontConfig.Font[] getFonts() {
+                        throw new IllegalStateException("the fonts of a later named family are read");
+                    }
+                }));
         for (String locale : LOCALES) {
             for (String name : new String[] {"Sans", "Serif", "SansMono"}) {
                 families.add(new FontConfig.Family(null, locale, font(name, 400), font(name + "-Bold", 700),
                         font(name.equals("Serif") ? "SerifCondensed" : "SansCondensed", 300)));
             }
         }
-        Check.isTrue(FontManager.setFontConfig(new FontConfig(families.toArray(new FontConfig.Family[0]))), "fonts");
+        Check.isTrue(FontManager.setFontConfig(new FontConfig(families.toArray(new FontConfig.Family[0]))),
+                "the configuration");
+        Check.isTrue(FontManager.setFontConfig(null), "once set, a configuration is not even looked at");
         int[] reference;
         try (GxText text = strokedBlock(Fixtures.SANS)) {
             reference = text.render().getPixels();
         }
         byte[] sans = Files.readAllBytes(Paths.get(Fixtures.SANS));
         Set<Integer> handles = ConcurrentHashMap.newKeySet();
-        ConcurrentLinkedQueue<Throwable> failures = new ConcurrentLinkedQueue<>();
+        Queue<Throwable> failures = new ConcurrentLinkedQueue<>();
         CountDownLatch start = new CountDownLatch(1);
         List<Thread> threads = new ArrayList<>();
         for (int t = 0; t < 8; t++) {
@@ -71,9 +74,9 @@ public class ThreadTest {
                         Check.isTrue(Arrays.equals(reference, text.render().getPixels()), "picture differs");
                         // A script the text's font lacks: its families load on first need.
                         String script = SCRIPTS[(i + seed) % SCRIPTS.length];
-                        Check.isTrue(text.setLayout(Fixtures.line(script, 28, -20, 5, 2f)) && text.render() != null,
+                        Check.isTrue(text.setLayout(Fixtures.line(script, 28, -20, 5)) && text.render() != null,
                                 "a picture of " + script);
-                        handles.add(Fixtures.handleOf(text));
+                        handles.add(Fixtures.handle().getInt(text));
                         if (i % 2 == 0) {
                             text.close(); // the others are dropped
                         }
