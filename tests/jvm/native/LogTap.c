@@ -1,8 +1,7 @@
 /* Test helper: sends the process's stderr to a file while a capture runs, so
-   the JVM tests can read the library's log lines. */
+   the JVM tests can read the library's log lines (stderr is unbuffered). */
 #include <fcntl.h>
 #include <jni.h>
-#include <stdio.h>
 #include <unistd.h>
 
 static int savedStderr = -1;
@@ -10,7 +9,6 @@ static int savedStderr = -1;
 /* To the file at `path`; back to the saved stderr when `path` is null. */
 JNIEXPORT void JNICALL Java_jvmtest_LogTap_redirect(JNIEnv* env, jclass cls, jstring path) {
     (void)cls;
-    fflush(stderr);
     if (path == NULL) {
         dup2(savedStderr, 2);
         close(savedStderr);

@@ -13,25 +13,20 @@ public final class Check {
         }
     }
 
-    /** Values, or int arrays: short ones are shown whole, of whole pictures the first differing pixel. */
+    /** Values (ints also in hex, as pixels are), or int arrays (sizes, ink boxes, pictures: the first difference). */
     public static void equal(Object expected, Object actual, String what) {
-        if (!(expected instanceof int[] && actual instanceof int[])) {
+        if (expected instanceof int[] && actual instanceof int[]) {
+            int[] e = (int[]) expected, a = (int[]) actual;
+            int i = Arrays.mismatch(e, a);
+            isTrue(i < 0 || i < Math.min(e.length, a.length), what + ": " + a.length + " values, not " + e.length);
+            isTrue(i < 0, i < 0 ? "" : String.format("%s: value %d is %d (%08X), expected %d (%08X)", what, i, a[i],
+                    a[i], e[i], e[i]));
+        } else if (expected instanceof Integer && actual instanceof Integer) {
+            isTrue(expected.equals(actual), String.format("%s: expected %d (%08X), got %d (%08X)", what, expected,
+                    expected, actual, actual));
+        } else {
             isTrue(Objects.equals(expected, actual), what + ": expected " + expected + ", got " + actual);
-            return;
         }
-        int[] e = (int[]) expected, a = (int[]) actual;
-        int i = Arrays.mismatch(e, a);
-        if (i >= 0 && e.length <= 4 && a.length <= 4) {
-            throw new AssertionError(what + ": expected " + Arrays.toString(e) + ", got " + Arrays.toString(a));
-        } else if (i >= 0) {
-            isTrue(i < Math.min(e.length, a.length), what + ": expected " + e.length + " values, got " + a.length);
-            throw new AssertionError(String.format("%s: value %d is %08X, expected %08X", what, i, a[i], e[i]));
-        }
-    }
-
-    /** Two 0xAARRGGBB pixels. */
-    public static void pixel(int expected, int actual, String what) {
-        isTrue(expected == actual, String.format("%s: expected pixel %08X, got %08X", what, expected, actual));
     }
 
     /** Runs the action, failing unless it throws that kind of exception. */

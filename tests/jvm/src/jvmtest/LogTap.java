@@ -2,11 +2,8 @@ package jvmtest;
 
 import static java.nio.charset.StandardCharsets.UTF_8;
 
-import java.nio.file.Files;
-import java.nio.file.Path;
-import java.util.ArrayList;
-import java.util.Arrays;
-import java.util.List;
+import java.nio.file.*;
+import java.util.*;
 
 /**
  * Captures the library's log lines. On Linux the library writes them to stderr as "P/tag: message" (with
@@ -34,7 +31,7 @@ public final class LogTap {
             } finally {
                 redirect(null);
             }
-            List<String> lines = new ArrayList<>(Arrays.asList(new String(Files.readAllBytes(file), UTF_8).split("\n")));
+            List<String> lines = Arrays.asList(new String(Files.readAllBytes(file), UTF_8).split("\n"));
             Files.delete(file);
             // Anything the JVM itself said goes on to the real stderr.
             lines.stream().filter(line -> !line.matches("^[DIWE?]/.*")).forEach(System.err::println);

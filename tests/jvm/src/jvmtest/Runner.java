@@ -1,12 +1,7 @@
 package jvmtest;
 
-import java.lang.reflect.InvocationTargetException;
-import java.lang.reflect.Method;
-import java.lang.reflect.Modifier;
-import java.util.ArrayList;
-import java.util.Arrays;
-import java.util.Comparator;
-import java.util.List;
+import java.lang.reflect.*;
+import java.util.*;
 
 /**
  * Runs the tests of the classes named on the command line, in that order: every public method without
@@ -19,13 +14,10 @@ public final class Runner {
         List<String> failures = new ArrayList<>();
         for (String name : args) {
             Class<?> suite = Class.forName(name);
-            Method[] tests = suite.getDeclaredMethods();
-            Arrays.sort(tests, Comparator.comparing(Method::getName));
+            Method[] tests = Arrays.stream(suite.getDeclaredMethods()).filter(m -> Modifier.isPublic(m.getModifiers())
+                    && !Modifier.isStatic(m.getModifiers()) && m.getParameterCount() == 0)
+                    .sorted(Comparator.comparing(Method::getName)).toArray(Method[]::new);
             for (Method m : tests) {
-                int modifiers = m.getModifiers();
-                if (!Modifier.isPublic(modifiers) || Modifier.isStatic(modifiers) || m.getParameterCount() > 0) {
-                    continue;
-                }
                 String id = suite.getSimpleName() + "." + m.getName();
                 try {
                     m.invoke(suite.getDeclaredConstructor().newInstance());

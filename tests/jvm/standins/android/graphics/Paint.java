@@ -18,6 +18,10 @@ public class Paint {
     public LocaleList textLocales;
     public Align textAlign = Align.LEFT;
 
+    public Paint() {}
+
+    public Paint(float textSize) { this.textSize = textSize; }
+
     public float getTextSize() { return textSize; }
     public float getTextScaleX() { return textScaleX; }
     public float getTextSkewX() { return textSkewX; }

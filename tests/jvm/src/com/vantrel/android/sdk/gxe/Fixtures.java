@@ -6,9 +6,9 @@ import android.widget.TextView;
 import com.vantrel.android.sdk.gxe.util.GxError;
 import java.lang.reflect.Field;
 import java.util.List;
+import java.util.concurrent.CompletableFuture;
 import java.util.function.Supplier;
-import jvmtest.Check;
-import jvmtest.LogTap;
+import jvmtest.*;
 
 /** Shared set-up for the bridge tests: texts, one-line layouts, handles, ink boxes, calls on fresh threads. */
 final class Fixtures {
@@ -18,19 +18,6 @@ final class Fixtures {
 
     private Fixtures() {}
 
-    static Paint paint(float size) {
-        Paint paint = new Paint();
-        paint.textSize = size;
-        return paint;
-    }
-
-    static TextView view(int width, int height) {
-        TextView view = new TextView();
-        view.width = width;
-        view.height = height;
-        return view;
-    }
-
     /** One line of all of `text`: baseline, ascent (negative) and descent, an em of width a character. */
     static Layout line(CharSequence text, int baseline, int ascent, int descent) {
         return new Layout(text, new float[] {0, text.length(), baseline, ascent, descent, 0f, -ascent * text.length()});
@@ -39,27 +26,23 @@ final class Fixtures {
     /** `text` in `font` (null: none) at `size` pixels in a `width` x `height` view, the baseline at 4/5. */
     static GxText text(String font, String text, int width, int height, float size) {
         GxText t = new GxText();
-        Check.isTrue((font == null || t.GxText_SetFont(font)) && t.GxText_SetPaint(paint(size))
-                && t.GxText_SetView(view(width, height))
+        Check.isTrue((font == null || t.GxText_SetFont(font)) && t.GxText_SetPaint(new Paint(size))
+                && t.GxText_SetView(new TextView(width, height))
                 && t.GxText_SetLayout(line(text, height * 4 / 5, -(int) size, (int) size / 4)), "set-up");
         return t;
     }
 
-    /** The 20-pixel BLOCK in DejaVu Sans with its baseline at 40 in a 60 x 50 view. */
-    static GxText block() {
-        return text(SANS, BLOCK, 60, 50, 20f);
-    }
-
-    /** Where block() puts ink. */
+    /** Where a 20-pixel BLOCK in DejaVu Sans puts ink, with its baseline at 40 in a 60 x 50 view. */
     static int[] blockInk() {
-        try (GxText text = block()) {
+        try (GxText text = text(SANS, BLOCK, 60, 50, 20f)) {
             return inkBox(text.render());
         }
     }
 
-    /** {left, top, right, bottom} (right and bottom exclusive) of the pixels with any alpha, or null. */
-    static int[] inkBox(int[] pixels, int width) {
-        int left = width, top = -1, right = 0, bottom = 0;
+    /** {left, top, right, bottom} (right and bottom exclusive) of the view's pixels with any alpha, or null. */
+    static int[] inkBox(GxText.Picture p) {
+        int[] pixels = viewPixels(p);
+        int width = p.getWidth() - p.getLeft() - p.getRight(), left = width, top = -1, right = 0, bottom = 0;
         for (int i = 0; i < pixels.length; i++) {
             if ((pixels[i] >>> 24) != 0) {
                 left = Math.min(left, i % width);
@@ -69,11 +52,6 @@ final class Fixtures {
             }
         }
         return top < 0 ? null : new int[] {left, top, right, bottom};
-    }
-
-    /** The ink box of the view's own area of a picture (the effect margins cut off). */
-    static int[] inkBox(GxText.Picture p) {
-        return inkBox(viewPixels(p), p.getWidth() - p.getLeft() - p.getRight());
     }
 
     /** The pixels of the view's own area of a picture (the effect margins cut off), row by row. */
@@ -101,9 +79,7 @@ final class Fixtures {
             System.gc();
             Thread.sleep(10);
         }
-        Check.equal(GxError.NOT_BOUND, errorAfter(() -> probe.GxText_SetLine(1)), "native text " + handle + " released");
-        handle().setInt(probe, -1);
-        probe.close();
+        Check.equal(GxError.NOT_BOUND, errorAfter(() -> probe.GxText_SetLine(1)), "native text " + handle + " gone");
     }
 
     /**
@@ -118,24 +94,16 @@ final class Fixtures {
             out[1] = GxError.getLastReason();
         }));
         Check.equal(expected, out[0], what);
-        Check.isTrue(out[1] != null && ((String) out[1]).contains(words), what + ": reason " + out[1] + " lacks " + words);
+        Check.isTrue(out[1] != null && ((String) out[1]).contains(words), what + ": reason " + out[1]);
         Check.equal(GxError.NONE, code[0], what + ": error code");
         Check.isTrue(line == null ? LogTap.count(log, "E/") == 0 : log.contains(line), what + ": log " + log);
     }
 
     /** The error code a fresh thread has after running the action. */
     static int errorAfter(Runnable action) {
-        int[] code = {-1};
-        Thread thread = new Thread(() -> {
+        return CompletableFuture.supplyAsync(() -> {
             action.run();
-            code[0] = GxError.getLastError();
-        });
-        thread.start();
-        try {
-            thread.join();
-        } catch (InterruptedException e) {
-            throw new AssertionError(e);
-        }
-        return code[0];
+            return GxError.getLastError();
+        }, task -> new Thread(task).start()).join();
     }
 }

@@ -1,6 +1,8 @@
 package com.vantrel.android.sdk.gxe;
 
+import android.graphics.Paint;
 import android.text.FontConfig;
+import android.widget.TextView;
 import com.vantrel.android.sdk.gxe.effect.Stroke;
 import com.vantrel.android.sdk.gxe.font.FontManager;
 import java.nio.file.*;
@@ -27,18 +29,17 @@ public class ThreadTest {
 
     private static GxText strokedBlock(String font) {
         GxText text = new GxText();
-        Check.isTrue(text.setFont(font) && text.setPaint(Fixtures.paint(20f)) && text.setView(Fixtures.view(40, 40))
+        Check.isTrue(text.setFont(font) && text.setPaint(new Paint(20f)) && text.setView(new TextView(40, 40))
                 && text.setLayout(Fixtures.line(Fixtures.BLOCK, 28, -20, 5))
                 && text.addStroke(new Stroke().size(2).color(0xFF0000)) == 0, "set-up with " + font);
         return text;
     }
 
     public void textsOnManyThreadsRenderAlikeAndAreAllReleased() throws Exception {
-        // A default family, an oblique font before its upright one, then a later named family (dropped before
-        // its fonts are read) and three families of three fonts for each locale.
+        // A default family, a later named family (dropped before its fonts are read) and three families of
+        // three fonts for each locale.
         List<FontConfig.Family> families = new ArrayList<>(Arrays.asList(new FontConfig.Family("sans-serif", null,
-                new FontConfig.Font(Fixtures.SANS.replace(".ttf", "-Oblique.ttf"), 400, true, null), font("Sans", 400)),
-                new FontConfig.Family("serif", null) {
+                font("Sans", 400), font("Sans-Bold", 700)), new FontConfig.Family("serif", null) {
                     @Override
                     public FontConfig.Font[] getFonts() {
                         throw new IllegalStateException("the fonts of a later named family are read");
@@ -53,45 +54,35 @@ public class ThreadTest {
         Check.isTrue(FontManager.setFontConfig(new FontConfig(families.toArray(new FontConfig.Family[0]))),
                 "the configuration");
         Check.isTrue(FontManager.setFontConfig(null), "once set, a configuration is not even looked at");
-        int[] reference;
-        try (GxText text = strokedBlock(Fixtures.SANS)) {
-            reference = text.render().getPixels();
-        }
+        int[] reference = strokedBlock(Fixtures.SANS).render().getPixels();
         byte[] sans = Files.readAllBytes(Paths.get(Fixtures.SANS));
         Set<Integer> handles = ConcurrentHashMap.newKeySet();
-        Queue<Throwable> failures = new ConcurrentLinkedQueue<>();
-        CountDownLatch start = new CountDownLatch(1);
-        List<Thread> threads = new ArrayList<>();
+        List<Callable<Object>> threads = new ArrayList<>();
         for (int t = 0; t < 8; t++) {
             int seed = t;
-            threads.add(new Thread(() -> {
-                try {
-                    start.await();
-                    // Fonts are added while other threads render.
-                    Check.isTrue(FontManager.insertFontData("thread-font-" + seed, sans.clone()), "insert");
-                    for (int i = 0; i < 30; i++) {
-                        GxText text = strokedBlock(i % 2 == 0 ? "thread-font-" + seed : Fixtures.SANS);
-                        Check.isTrue(Arrays.equals(reference, text.render().getPixels()), "picture differs");
-                        // A script the text's font lacks: its families load on first need.
-                        String script = SCRIPTS[(i + seed) % SCRIPTS.length];
-                        Check.isTrue(text.setLayout(Fixtures.line(script, 28, -20, 5)) && text.render() != null,
-                                "a picture of " + script);
-                        handles.add(Fixtures.handle().getInt(text));
-                        if (i % 2 == 0) {
-                            text.close(); // the others are dropped
-                        }
+            threads.add(() -> {
+                // Fonts are added while other threads render.
+                Check.isTrue(FontManager.insertFontData("thread-font-" + seed, sans.clone()), "insert");
+                for (int i = 0; i < 30; i++) {
+                    GxText text = strokedBlock(i % 2 == 0 ? "thread-font-" + seed : Fixtures.SANS);
+                    Check.isTrue(Arrays.equals(reference, text.render().getPixels()), "picture differs");
+                    // A script the text's font lacks: its families load on first need.
+                    String script = SCRIPTS[(i + seed) % SCRIPTS.length];
+                    Check.isTrue(text.setLayout(Fixtures.line(script, 28, -20, 5)) && text.render() != null,
+                            "a picture of " + script);
+                    handles.add(Fixtures.handle().getInt(text));
+                    if (i % 2 == 0) {
+                        text.close(); // the others are dropped
                     }
-                } catch (Throwable e) {
-                    failures.add(e);
                 }
-            }));
+                return null;
+            });
         }
-        threads.forEach(Thread::start);
-        start.countDown();
-        for (Thread thread : threads) {
-            thread.join();
+        ExecutorService pool = Executors.newFixedThreadPool(8);
+        for (Future<Object> thread : pool.invokeAll(threads)) {
+            thread.get(); // throws what the thread threw
         }
-        Check.isTrue(failures.isEmpty(), "a thread failed: " + failures.peek());
+        pool.shutdown();
         Check.equal(8 * 30, handles.size(), "distinct handles");
         for (int handle : handles) {
             Fixtures.awaitRelease(handle);
