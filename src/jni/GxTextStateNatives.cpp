@@ -165,8 +165,11 @@ void DeleteLines(List* lines) {
 // the spans from the last; false when there is none (or it cannot be read).
 bool FindBackgroundColor(JNIEnv* env, JavaCalls& java, jobject text, jint length, jint* color) {
     if (text == nullptr) return false;
+    // No JNI call may run with an exception pending: a missing first class is
+    // cleared before the second is looked up.
     LocalRef<jclass> spannable(env, env->FindClass("android/text/SpannableString"));
-    LocalRef<jclass> spanClass(env, env->FindClass("android/text/style/BackgroundColorSpan"));
+    if (!spannable) Jni::ClearException(env);
+    LocalRef<jclass> spanClass(env, spannable ? env->FindClass("android/text/style/BackgroundColorSpan") : nullptr);
     if (!spannable || !spanClass) {
         Jni::ClearException(env);
         LogPrint(kLogDebug, kTag, "GxText_SetLayout - no span classes");
