@@ -3,6 +3,9 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
+#include <vector>
+
 #include "api/LineLayout.h"
 
 namespace glimmer::detail {
@@ -11,50 +14,33 @@ namespace {
 // Every UTF-16 unit 10 pixels wide.
 float TenEach(size_t start, size_t end) { return 10.0f * float(end - start); }
 
-TEST(LineBreakingTest, WrapsAtBreakOpportunitiesKeepingSpacesOnTheLine) {
-    const std::vector<LayoutLine> lines = BreakLines(u"aaa bbb ccc", TenEach, 65.0f);
-    ASSERT_EQ(lines.size(), 3u);
-    EXPECT_EQ(lines[0].start, 0);
-    EXPECT_EQ(lines[0].end, 4);          // the space stays on the first line
-    EXPECT_EQ(lines[0].visibleEnd, 3);   // but is not visible
-    EXPECT_EQ(lines[0].width, 30.0f);
-    EXPECT_EQ(lines[1].start, 4);
-    EXPECT_EQ(lines[2].start, 8);
-    EXPECT_EQ(lines[2].visibleEnd, 11);
+// Each line as (start, end, visible end, width).
+using Lines = std::vector<std::array<float, 4>>;
 
-    // Two words fit in 70 (the trailing space does not count).
-    const std::vector<LayoutLine> two = BreakLines(u"aaa bbb ccc", TenEach, 70.0f);
-    ASSERT_EQ(two.size(), 2u);
-    EXPECT_EQ(two[0].visibleEnd, 7);
-    EXPECT_EQ(two[0].width, 70.0f);
-
-    // A hyphen is an opportunity; a split on spaces would miss it.
-    const std::vector<LayoutLine> hyphen = BreakLines(u"well-known", TenEach, 60.0f);
-    ASSERT_EQ(hyphen.size(), 2u);
-    EXPECT_EQ(hyphen[0].visibleEnd, 5);
+Lines Broken(const std::u16string& text, float width) {
+    Lines out;
+    for (const LayoutLine& l : BreakLines(text, TenEach, width)) {
+        out.push_back({float(l.start), float(l.end), float(l.visibleEnd), l.width});
+    }
+    return out;
 }
 
-TEST(LineBreakingTest, CutsAWordTooWideBetweenClustersAndSplitsAtNewlines) {
-    const std::vector<LayoutLine> cut = BreakLines(u"abcdefg", TenEach, 30.0f);
-    ASSERT_EQ(cut.size(), 3u);
-    EXPECT_EQ(cut[0].visibleEnd, 3);
-    EXPECT_EQ(cut[1].start, 3);
-    EXPECT_EQ(cut[2].visibleEnd, 7);
-
-    // e + combining acute is one cluster: never cut between them.
-    const std::vector<LayoutLine> cluster = BreakLines(u"ae\u0301bc", TenEach, 20.0f);
-    ASSERT_GE(cluster.size(), 2u);
-    EXPECT_NE(cluster[0].visibleEnd, 2);
-
-    const std::vector<LayoutLine> paragraphs = BreakLines(u"ab\n\ncd\n", TenEach, 0.0f);
-    ASSERT_EQ(paragraphs.size(), 4u);   // "ab", "", "cd", and the empty line after the final break
-    EXPECT_EQ(paragraphs[0].end, 3);
-    EXPECT_EQ(paragraphs[0].visibleEnd, 2);
-    EXPECT_EQ(paragraphs[1].start, 3);
-    EXPECT_EQ(paragraphs[1].visibleEnd, 3);
-    EXPECT_EQ(paragraphs[2].width, 20.0f);
-    EXPECT_EQ(paragraphs[3].start, 7);
-    EXPECT_EQ(paragraphs[3].visibleEnd, 7);
+TEST(LineBreakingTest, WrapsAtOpportunitiesCutsTooWideWordsAndSplitsAtNewlines) {
+    const struct {
+        const char16_t* text;
+        float width;
+        Lines lines;
+    } cases[] = {
+        // Trailing spaces stay on the line but are not visible, nor measured.
+        {u"aaa bbb ccc", 65.0f, {{0, 4, 3, 30}, {4, 8, 7, 30}, {8, 11, 11, 30}}},
+        {u"aaa bbb ccc", 70.0f, {{0, 8, 7, 70}, {8, 11, 11, 30}}},
+        {u"well-known", 60.0f, {{0, 5, 5, 50}, {5, 10, 10, 50}}},   // a hyphen is an opportunity
+        {u"abcdefg", 30.0f, {{0, 3, 3, 30}, {3, 6, 6, 30}, {6, 7, 7, 10}}},
+        {u"ae\u0301bc", 20.0f, {{0, 1, 1, 10}, {1, 3, 3, 20}, {3, 5, 5, 20}}},   // e + acute is one cluster
+        // "ab", "", "cd", and the empty line after the final break.
+        {u"ab\n\ncd\n", 0.0f, {{0, 3, 2, 20}, {3, 4, 3, 0}, {4, 7, 6, 20}, {7, 7, 7, 0}}},
+    };
+    for (const auto& c : cases) EXPECT_EQ(Broken(c.text, c.width), c.lines) << "width " << c.width;
 }
 
 TEST(LinePlacingTest, FontPaddingAndAlignment) {
