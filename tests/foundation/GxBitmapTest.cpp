@@ -17,15 +17,12 @@ TEST(GxBitmap, FormatsFollowTheDepthAndCopiesOwnTheirPixels) {
     ASSERT_NE(color.pixels, nullptr);
     EXPECT_EQ(color.pixels[15], 0);   // cleared
     color.pixels[15] = 20;
-
     GxBitmap assigned(9, 9, 1);
     assigned = color;
-    ASSERT_NE(assigned.pixels, color.pixels);
-    EXPECT_EQ(0, std::memcmp(assigned.pixels, color.pixels, 16));
-    EXPECT_EQ(assigned.format, 1u);
     GxBitmap& self = assigned;
     assigned = self;
-    ASSERT_NE(assigned.pixels, nullptr);
+    ASSERT_NE(assigned.pixels, color.pixels);
+    EXPECT_EQ(assigned.format, 1u);
     EXPECT_EQ(assigned.pixels[15], 20);
 }
 
