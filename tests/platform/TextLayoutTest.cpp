@@ -92,7 +92,6 @@ TEST_F(TextLayoutTest, FontsAreMadeOnlyOfReadableFacesInRange) {
     };
     for (const auto& c : refused) EXPECT_EQ(CreateFont(c.data, c.size, c.index, FontData::kBorrowed), nullptr) << c.what;
 
-    EXPECT_STREQ(sans->FamilyName(), "DejaVu Sans");
     EXPECT_FALSE(sans->HasGlyph(0x6F22));
     EXPECT_TRUE(emoji->HasColorGlyphs());
     EXPECT_FALSE(sans->HasColorGlyphs());
@@ -124,7 +123,8 @@ TEST_F(TextLayoutTest, FontsAreChosenByFamilyOrderThenByStyle) {
     typeface.families = {FamilyOf({{sans, 400, false}}), FamilyOf({{cjk, 400, false}})};
     std::vector<const Font*> fonts;
     for (const LayoutGlyph& glyph : LayOut(typeface, u"A\u6F22Be\u0301").glyphs) fonts.push_back(glyph.font);
-    EXPECT_EQ(fonts, (std::vector<const Font*>{sans.get(), cjk.get(), sans.get(), sans.get()}));   // e + acute: one glyph
+    EXPECT_EQ(fonts, (std::vector<const Font*>{sans.get(), cjk.get(), sans.get(), sans.get()}))
+        << "A, Han, B and e + acute (one glyph) should come from DejaVu, the CJK face, DejaVu, DejaVu";
     typeface.families = {FamilyOf({{cjk, 400, false}}), FamilyOf({{sans, 400, false}})};
     EXPECT_EQ(LayOut(typeface, u"A\u6F22B").runs.size(), 1u);   // the CJK face also has Latin
 
