@@ -42,11 +42,10 @@ std::vector<Platform::SystemFontFamily> LongConfiguration() {
         {"DejaVuSansMono.ttf", "DejaVuSansMono-Bold.ttf", "DejaVuSansCondensed.ttf"},
     }};
     std::vector<Platform::SystemFontFamily> config;
-    Platform::SystemFontFamily first{"sans-serif", "", 0, {}};
+    config.push_back({"sans-serif", "", 0, {}});
     for (const char* name : {"DejaVuSans.ttf", "DejaVuSans-Bold.ttf", "DejaVuSerif.ttf", "DejaVuSansMono.ttf"}) {
-        first.fonts.push_back({dir + name, 0, 400, false, name, ""});
+        config[0].fonts.push_back({dir + name, 0, 400, false, name, ""});
     }
-    config.push_back(first);
     // Three families for each of ten locale lists, each loaded on first need.
     const char* locales[] = {"und-Arab", "und-Grek", "und-Cyrl", "und-Hebr", "und-Thai",
                              "und-Deva", "ja",       "ko",       "zh-Hans",  "zh-Hant"};
@@ -70,9 +69,7 @@ const wchar_t* const kTexts[] = {
 
 std::shared_mutex gFonts;   // the bridge's font lock, as the natives take it
 
-struct Picture {
-    std::vector<unsigned> pixels;
-};
+using Picture = std::vector<unsigned>;
 
 void RenderOnThread(int thread, std::vector<Picture>& last, std::atomic<int>& failures) {
     GxTextObject text;
@@ -124,13 +121,8 @@ void RenderOnThread(int thread, std::vector<Picture>& last, std::atomic<int>& fa
                     if (families.size() < 1) ++failures;
                 }
             }
-            if (pixels == nullptr) {
-                ++failures;
-                continue;
-            }
-            if (round == kRounds - 1) {
-                last[size_t((k + thread) % texts)].pixels.assign(pixels, pixels + size_t(width) * height);
-            }
+            if (pixels == nullptr) ++failures;
+            else if (round == kRounds - 1) last[size_t((k + thread) % texts)].assign(pixels, pixels + size_t(width) * height);
         }
     }
 }
@@ -138,8 +130,7 @@ void RenderOnThread(int thread, std::vector<Picture>& last, std::atomic<int>& fa
 TEST(ThreadStressTest, TextsRenderSideBySideWhileFamiliesLoad) {
     ASSERT_TRUE(InstallSystemFontFamilies(FontManager::GetInstance(), LongConfiguration()));
     const List* families = FontManager::GetInstance()->GetSystemFontFamilies();
-    ASSERT_NE(families, nullptr);
-    ASSERT_EQ(families->GetCount(), 31);
+    ASSERT_EQ(families != nullptr ? families->GetCount() : 0, 31);
 
     std::vector<std::vector<Picture>> last(kThreads, std::vector<Picture>(std::size(kTexts)));
     std::atomic<int> failures{0};
@@ -157,8 +148,8 @@ TEST(ThreadStressTest, TextsRenderSideBySideWhileFamiliesLoad) {
     EXPECT_GE(built, 1 + 3 * 9);
     for (size_t k = 0; k < std::size(kTexts); ++k) {
         for (int t = 1; t < kThreads; ++t) {
-            ASSERT_FALSE(last[size_t(t)][k].pixels.empty());
-            EXPECT_TRUE(last[size_t(t)][k].pixels == last[0][k].pixels) << "text " << k << ", thread " << t;
+            ASSERT_FALSE(last[size_t(t)][k].empty());
+            EXPECT_TRUE(last[size_t(t)][k] == last[0][k]) << "text " << k << ", thread " << t;
         }
     }
 }
