@@ -172,6 +172,3 @@ TEST(RenderTextTest, RendersOnSeveralThreadsGiveOnePicture) {
 
 }  // namespace
 }  // namespace glimmer
-
-// fontconfig 2.14 loses a few hundred bytes inside FcInit, once per process.
-extern "C" const char* __lsan_default_suppressions() { return "leak:libfontconfig.so\n"; }

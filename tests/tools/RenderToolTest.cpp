@@ -144,6 +144,3 @@ TEST(RenderFilesTest, ImagesAndRequestsAreReadOnlyFromRegularFilesOfBoundedSize)
 
 }  // namespace
 }  // namespace Glimmer::RenderTool
-
-// fontconfig 2.14 loses a few hundred bytes inside FcInit, once per process.
-extern "C" const char* __lsan_default_suppressions() { return "leak:libfontconfig.so\n"; }
