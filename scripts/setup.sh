@@ -22,6 +22,9 @@ packages=(
   libharfbuzz-dev:arm64 libfreetype-dev:arm64 libfontconfig-dev:arm64
   # the command-line renderer: PNG files, line breaking, JSON effect files
   libpng-dev libicu-dev nlohmann-json3-dev libpng-dev:arm64 libicu-dev:arm64
+  # the thread-sanitizer and fuzz builds (clang with its sanitizer and libFuzzer
+  # runtimes) and the memcheck runs of the renderer
+  clang libclang-rt-14-dev valgrind
 )
 
 missing=()

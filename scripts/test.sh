@@ -1,6 +1,8 @@
 #!/usr/bin/env bash
 # Installs what is missing, then configures, builds and runs every test in each
-# preset: the optimised build, the ASan+UBSan build and the 64-bit Arm cross
+# preset: the optimised build, the ASan+UBSan build, the ThreadSanitizer build
+# (only the tests that start threads), the fuzz build (the fuzz targets only:
+# their corpora, then a few seconds of fuzzing each) and the 64-bit Arm cross
 # build under qemu. Pass preset names to run only those.
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -8,7 +10,7 @@ cd "$(dirname "$0")/.."
 scripts/setup.sh
 
 presets=("$@")
-((${#presets[@]})) || presets=(default asan aarch64)
+((${#presets[@]})) || presets=(default asan tsan fuzz aarch64)
 
 jobs=$(nproc)
 for preset in "${presets[@]}"; do

@@ -15,7 +15,19 @@
 #include <cstdint>
 #include <vector>
 
+#if HWY_ARCH_X86
+#include <cpuid.h>
+#endif
+
 namespace Glimmer::KernelTargets {
+
+#if HWY_ARCH_X86
+// F16C from CPUID itself: clang 14's __builtin_cpu_supports does not know it.
+inline bool CpuHasF16c() {
+    unsigned a = 0, b = 0, c = 0, d = 0;
+    return __get_cpuid(1, &a, &b, &c, &d) != 0 && (c & bit_F16C) != 0;
+}
+#endif
 
 // Whether this CPU (and its OS) runs code compiled for `target`: every
 // feature Highway compiles that target with (hwy/ops/set_macros-inl.h).
@@ -27,7 +39,7 @@ inline bool CpuRuns(int64_t target) {
                       __builtin_cpu_supports("aes");
     const bool avx2 = sse4 && __builtin_cpu_supports("avx") && __builtin_cpu_supports("avx2") &&
                       __builtin_cpu_supports("bmi") && __builtin_cpu_supports("bmi2") &&
-                      __builtin_cpu_supports("fma") && __builtin_cpu_supports("f16c");
+                      __builtin_cpu_supports("fma") && CpuHasF16c();
     const bool avx3 = avx2 && __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512vl") &&
                       __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512bw");
     switch (target) {

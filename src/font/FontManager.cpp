@@ -229,6 +229,10 @@ bool FontManager::AddMinikinFont(const char* path, char* data, unsigned int size
     return true;
 }
 
+void FontManager::ForgetMinikinFont(const char* path, int ttcIndex) {
+    if (M != nullptr && path != nullptr) M->fontMap.erase(FontKey(path, ttcIndex));
+}
+
 bool FontManager::AddMinikinFont(const GxString* path, char* data, unsigned int size, int ttcIndex,
                                  bool checkExisting) {
     if (path == nullptr || path->GetUTF8Size() < 0) {

@@ -48,6 +48,12 @@ public:
     bool AddMinikinFont(const GxString* path, char* data, unsigned int size, int ttcIndex,
                         bool checkExisting);
 
+    // Forgets face `ttcIndex` of the font made from bytes handed in under
+    // `path`; whoever still holds the face keeps it until they let go. Only
+    // the font-bytes fuzzer calls it: its throwaway fonts would otherwise stay
+    // for the life of the process.
+    void ForgetMinikinFont(const char* path, int ttcIndex);
+
     // Loads every font of the family; false at the first that fails.
     bool BuildMinikinFamily(GxFontFamily* family);
     // Builds the first unbuilt system family of that locale list.

@@ -2,7 +2,17 @@
 // Indexed access remembers the last node it reached, so that walking a list
 // with Get(0), Get(1), ... costs one step per call; the walk starts from
 // whichever of the first node, the last node and the remembered one is
-// nearest. Any change to the chain forgets the remembered node.
+// nearest.
+//
+// The remembered node is the caller's, not the list's: each thread keeps a
+// few (list, index, node) memos of its own. Get is a read, and a list read by
+// several threads at once (the font manager's families while texts render
+// side by side under a shared lock) must not be written by those reads; a
+// memo inside the list was, and one reader's index paired with another's
+// node walked off the chain. A memo names its list by a stamp that no list
+// ever had before, renewed by every change to the chain, so a memo of a
+// changed or freed list is never used. Changes still need the caller's
+// exclusive access, as before.
 //
 // Traversal cursors live in a table of ten slots. A cursor is handed out as
 // the address of its heap cell, but it is only ever dereferenced after it has
@@ -12,6 +22,8 @@
 
 #include "foundation/List.h"
 
+#include <atomic>
+#include <cstdint>
 #include <new>
 
 #include "foundation/Error.h"
@@ -26,6 +38,20 @@ struct ListNode {
     ListNode* next = nullptr;
     void* item = nullptr;
 };
+
+// Stamps for chains: process-wide, never reused (64 bits do not wrap).
+std::atomic<uint64_t> gNextStamp{1};
+uint64_t NewStamp() { return gNextStamp.fetch_add(1, std::memory_order_relaxed); }
+
+// This thread's last few positions in lists (nested walks use two or three).
+struct WalkMemo {
+    uint64_t stamp = 0;
+    int index = 0;
+    ListNode* node = nullptr;
+};
+constexpr int kWalkMemos = 4;
+thread_local WalkMemo tWalkMemos[kWalkMemos];
+thread_local int tNextWalkMemo = 0;
 
 struct ListCursor {
     ListNode* node = nullptr;  // null: past either end
@@ -65,13 +91,10 @@ struct ListImpl {
     int count = 0;
     int traversals = 0;
     ListCursor* cursors[List::kMaxTraversals] = {};
-    mutable int cacheIndex = -1;
-    mutable ListNode* cacheNode = nullptr;
+    uint64_t stamp = NewStamp();
 
-    void Forget() const {
-        cacheIndex = -1;
-        cacheNode = nullptr;
-    }
+    // After any change to the chain: memos of it become stale.
+    void Forget() { stamp = NewStamp(); }
 
     // Links `chain` in before `at` (at the end when `at` is null).
     void Splice(Chain& chain, ListNode* at) {
@@ -117,14 +140,22 @@ struct ListImpl {
         if (count - 1 - index < distance) {
             node = last, at = count - 1, distance = count - 1 - index;
         }
-        if (cacheNode != nullptr) {
-            int fromCache = cacheIndex > index ? cacheIndex - index : index - cacheIndex;
-            if (fromCache < distance) node = cacheNode, at = cacheIndex;
+        WalkMemo* memo = nullptr;
+        for (WalkMemo& m : tWalkMemos) {
+            if (m.stamp == stamp) memo = &m;
+        }
+        if (memo != nullptr) {
+            int fromMemo = memo->index > index ? memo->index - index : index - memo->index;
+            if (fromMemo < distance) node = memo->node, at = memo->index;
+        } else {
+            memo = &tWalkMemos[tNextWalkMemo];
+            tNextWalkMemo = (tNextWalkMemo + 1) % kWalkMemos;
+            memo->stamp = stamp;
         }
         for (; at < index; ++at) node = node->next;
         for (; at > index; --at) node = node->prev;
-        cacheIndex = index;
-        cacheNode = node;
+        memo->index = index;
+        memo->node = node;
         return node;
     }
 

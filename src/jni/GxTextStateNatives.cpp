@@ -165,8 +165,11 @@ void DeleteLines(List* lines) {
 // the spans from the last; false when there is none (or it cannot be read).
 bool FindBackgroundColor(JNIEnv* env, JavaCalls& java, jobject text, jint length, jint* color) {
     if (text == nullptr) return false;
+    // No JNI call may run with an exception pending: a missing first class is
+    // cleared before the second is looked up.
     LocalRef<jclass> spannable(env, env->FindClass("android/text/SpannableString"));
-    LocalRef<jclass> spanClass(env, env->FindClass("android/text/style/BackgroundColorSpan"));
+    if (!spannable) Jni::ClearException(env);
+    LocalRef<jclass> spanClass(env, spannable ? env->FindClass("android/text/style/BackgroundColorSpan") : nullptr);
     if (!spannable || !spanClass) {
         Jni::ClearException(env);
         LogPrint(kLogDebug, kTag, "GxText_SetLayout - no span classes");
@@ -417,6 +420,23 @@ jboolean GxText_SetLayout(JNIEnv* env, jobject thiz, jobject layout) {
     }
     LocalRef<jstring> string(env, textString);
     jint length = string ? env->GetStringLength(string.get()) : 0;
+    // The text is taken whole or the call fails before anything changes. The
+    // core's strings end at U+0000, so a text holding it cannot be taken: a
+    // text cut short (or the old one kept beside the new lines) would draw
+    // something the caller never asked for.
+    GxString value;
+    bool haveText = false;
+    if (string) {
+        Jni::Utf8Chars chars(env, string.get());
+        if (chars.get() != nullptr) {
+            if (!value.Construct(chars.get())) {
+                Error::SetReason("the text cannot be taken (it holds U+0000 or is not valid UTF-16)");
+                LogPrint(kLogError, kTag, "GxText_SetLayout - RH(%d) text not taken", object->GetRuntimeHandle());
+                return JNI_FALSE;
+            }
+            haveText = true;
+        }
+    }
     jint background = 0;
     bool hasBackground = FindBackgroundColor(env, java, text.get(), length, &background);
 
@@ -499,11 +519,7 @@ jboolean GxText_SetLayout(JNIEnv* env, jobject thiz, jobject layout) {
     // families of its scripts.
     {
         std::unique_lock<std::shared_mutex> fonts(Bridge::FontStateLock());
-        Jni::Utf8Chars chars(env, string.get());
-        if (chars.get() != nullptr) {
-            GxString value;
-            if (value.Construct(chars.get())) object->SetText(&value);
-        }
+        if (haveText) object->SetText(&value);
     }
     object->SetBackgroundColor(uint32_t(background), hasBackground);
     if (!object->SetLineInfo(lines)) {

@@ -522,9 +522,26 @@ unsigned* GxTextObject::RenderTextEffect(int width, int height) {
     // the clip are cleared. With boxes a second image takes the background
     // and the effect picture is drawn over it.
     const bool boxes = M->hasBackground && M->lineInfo != nullptr && M->lineInfo->GetCount() > 0;
+    // An image too large to hold is refused before anything is drawn: the
+    // line masks and the effects' work images would be had (and filled) in
+    // vain. The last picture stays as it was.
+    size_t imageBytes = 0;
+    if (!GxBitmap::PixelBytes(unsigned(width), unsigned(height), 4, &imageBytes)) {
+        Error::SetReason("a %d x %d picture is too large to hold", width, height);
+        Platform::LogPrint(Platform::kLogError, kTag, "RenderTextEffect(%p) - %d x %d is too large",
+                           static_cast<void*>(this), width, height);
+        Error::SetError(kErrorInvalidArgument);
+        return nullptr;
+    }
     GxBitmap* effectBitmap =
         ImageOfSize(boxes ? &M->result : &M->spareImage, unsigned(width), unsigned(height), true);
     if (effectBitmap == nullptr) return nullptr;
+    if (effectBitmap->pixels == nullptr) {   // out of memory: nothing to draw into
+        delete effectBitmap;
+        Error::SetReason("no memory for a %d x %d picture", width, height);
+        Error::SetError(kErrorSystemCall);
+        return nullptr;
+    }
 
     if (M->effect != nullptr) M->effect->setWordOrderOutput(true);
     M->fontDrawing->DrawTextEffect(this, effectBitmap);

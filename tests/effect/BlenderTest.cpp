@@ -1,16 +1,14 @@
 // The compositor: each blend rule on hand-computed pixels, the clipping
-// edges, and the properties that hold for every input.
+// edges, the refusals, and a property that holds for every input.
 
 #include <gtest/gtest.h>
 
 #include <array>
-#include <bit>
 #include <climits>
 #include <cstdint>
 #include <cstring>
 #include <vector>
 
-#include "effect/GxBlendRows.h"
 #include "effect/GxBlender.h"
 #include "foundation/GxBitmap.h"
 #include "support/LogCapture.h"
@@ -30,144 +28,78 @@ Px Get(const GxBitmap& b, int x, int y) {
     return {d[0], d[1], d[2], d[3]};
 }
 
-// One pixel through an 8-bit-source operation.
-template <typename Op>
-Px Blend1(Px dst, uint8_t coverage, Op op) {
+// How one source pixel reaches the destination.
+enum Source {
+    kCoverage,  // a coverage byte m in `color`, through drawBitmapBlend8 in `mode`
+    kWord,      // the 32-bit word `color`, through drawBitmapBlend32 in `mode`
+    kBytes,     // the bytes R, G, B, A of `color` (0xRRGGBBAA), destination-over, flag = mode
+    kOverwrite  // coverage m as the alpha of `color`, through drawBitmap
+};
+
+Px Draw(Source source, int mode, uint32_t color, Px dst, uint8_t m) {
     GxBitmap b(1, 1, 4);
     Set(b, 0, 0, dst);
-    op(&b, &coverage);
+    const uint8_t bytes[4] = {uint8_t(color >> 24), uint8_t(color >> 16), uint8_t(color >> 8), uint8_t(color)};
+    switch (source) {
+        case kCoverage: GxBlender::drawBitmapBlend8(0, 0, &b, &m, 1, 1, 1, color, mode); break;
+        case kWord: GxBlender::drawBitmapBlend32(0, 0, &b, &color, 1, 1, 1, mode); break;
+        case kBytes: GxBlender::drawBitmapBlend32(0, 0, &b, bytes, 1, 1, 1, 0, mode); break;
+        case kOverwrite: GxBlender::drawBitmap(0, 0, &b, &m, 1, 1, color); break;
+    }
     return Get(b, 0, 0);
 }
-
-Px Mode(int mode, unsigned color, Px dst, uint8_t m) {
-    return Blend1(dst, m, [&](GxBitmap* b, const uint8_t* s) {
-        GxBlender::drawBitmapBlend8(0, 0, b, s, 1, 1, 1, color, mode);
-    });
-}
-
-Px Words(int mode, uint32_t src, Px dst) {
-    GxBitmap b(1, 1, 4);
-    Set(b, 0, 0, dst);
-    GxBlender::drawBitmapBlend32(0, 0, &b, &src, 1, 1, 1, mode);
-    return Get(b, 0, 0);
-}
-
-// --- blend rules, one hand-computed pixel per case
 
 TEST(BlenderRules, OnePixelByHand) {
     const struct {
-        bool words;     // a 32-bit source word instead of a coverage byte
+        Source source;
         int mode;
-        uint32_t color;   // the colour, or the source word
+        uint32_t color;
         Px dst;
         uint8_t m;
         Px expected;
-        const char* why;
+        const char* rule;
     } cases[] = {
-        {false, 1, 0x80FF8040, {10, 20, 30, 40}, 255, {255, 138, 79, 148}, "source-over: s = 129 * 255, a = 128"},
-        {false, 1, 0xFF112233, {9, 9, 9, 9}, 255, {0x11, 0x22, 0x33, 255}, "opaque coverage replaces"},
-        {false, 1, 0xFEFFFFFF, {1, 2, 3, 4}, 1, {1, 2, 3, 4}, "(254 + 1) * 1 leaves no trace"},
-        {false, 1, 0x00FFFFFF, {1, 2, 3, 4}, 255, {1, 2, 3, 4}, "transparent colour"},
-        {false, 1, 0xFFFFFFFF, {0, 0, 0, 0}, 1, {1, 1, 1, 1}, "(255 + 1) * 1 does"},
-        {false, 2, 0xFF204060, {0, 0, 0, 0}, 128, {16, 32, 48, 128}, "destination-over by coverage"},
-        {false, 2, 0xFF204060, {100, 50, 25, 128}, 128, {108, 66, 49, 191}, "destination-over, partial"},
-        {false, 2, 0xFF204060, {1, 2, 3, 4}, 0, {1, 2, 3, 4}, "no coverage"},
-        {false, 3, 0x80402010, {0, 0, 0, 0}, 1, {64, 32, 16, 128}, "coverage as a switch"},
-        {false, 3, 0x80402010, {10, 10, 10, 100}, 1, {49, 29, 20, 178}, "switch over partial"},
-        {false, 3, 0x80402010, {10, 10, 10, 100}, 0, {10, 10, 10, 100}, "switch off"},
-        {false, 7, 0xFF808080, {0, 0, 0, 0}, 128, {64, 64, 64, 128}, "fill: coverage-scaled on clear"},
-        {false, 7, 0xFF808080, {10, 20, 30, 100}, 255, {88, 98, 108, 255}, "fill: full coverage, unscaled"},
-        {false, 7, 0x80808080, {10, 20, 30, 100}, 255, {88, 98, 108, 178}, "fill: translucent colour"},
-        {false, 7, 0xFF808080, {200, 100, 50, 255}, 128, {100, 50, 25, 128}, "fill over opaque halves"},
-        {false, 7, 0xFF808080, {40, 40, 40, 100}, 128, {40, 40, 40, 89}, "fill: combined, then scaled"},
-        {false, 7, 0xFF808080, {40, 40, 40, 100}, 0, {40, 40, 40, 100}, "fill outside the glyphs"},
-        {false, 7, 0xFFFF0000, {255, 0, 0, 1}, 254, {255, 0, 0, 253}, "saturates past 16 bits (not 249)"},
-        {true, 1, 0x80402010, {100, 100, 100, 200}, 0, {114, 82, 66, 227}, "image source-over"},
-        {true, 1, 0xFF010203, {100, 100, 100, 200}, 0, {1, 2, 3, 255}, "opaque image source-over"},
-        {true, 1, 0x00000000, {100, 90, 80, 70}, 0, {100, 90, 80, 70}, "transparent image source-over"},
-        {true, 2, 0x80402010, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "image destination-over"},
-        {true, 2, 0x80402010, {0, 0, 0, 0}, 0, {64, 32, 16, 128}, "image destination-over on clear"},
-        {true, 2, 0x00402010, {0, 0, 0, 0}, 0, {0, 0, 0, 0}, "transparent image destination-over"},
-        {true, 3, 0x80402010, {7, 7, 7, 7}, 0, {7, 7, 7, 7}, "images know no mode 3"},
+        {kCoverage, 1, 0x80FF8040, {10, 20, 30, 40}, 255, {255, 138, 79, 148}, "source-over: s = 129 * 255, a = 128"},
+        {kCoverage, 1, 0xFFFFFFFF, {0, 0, 0, 0}, 1, {1, 1, 1, 1}, "(255 + 1) * 1 leaves a trace"},
+        {kCoverage, 2, 0xFF204060, {100, 50, 25, 128}, 128, {108, 66, 49, 191}, "destination-over, partial"},
+        {kCoverage, 3, 0x80402010, {10, 10, 10, 100}, 1, {49, 29, 20, 178}, "switch over partial"},
+        {kCoverage, 3, 0x80402010, {10, 10, 10, 100}, 0, {10, 10, 10, 100}, "switch off"},
+        {kCoverage, 7, 0xFF808080, {10, 20, 30, 100}, 255, {88, 98, 108, 255}, "fill: full coverage, unscaled"},
+        {kCoverage, 7, 0xFF808080, {200, 100, 50, 255}, 128, {100, 50, 25, 128}, "fill over opaque halves"},
+        {kCoverage, 7, 0xFF808080, {40, 40, 40, 100}, 128, {40, 40, 40, 89}, "fill: combined, then scaled"},
+        {kCoverage, 7, 0xFFFF0000, {255, 0, 0, 1}, 254, {255, 0, 0, 253}, "saturates past 16 bits (not 249)"},
+        {kWord, 1, 0x80402010, {100, 100, 100, 200}, 0, {114, 82, 66, 227}, "image source-over"},
+        {kWord, 2, 0x80402010, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "image destination-over"},
+        {kWord, 2, 0x00402010, {0, 0, 0, 0}, 0, {0, 0, 0, 0}, "transparent image destination-over"},
+        {kWord, 3, 0x80402010, {7, 7, 7, 7}, 0, {7, 7, 7, 7}, "images know no mode 3"},
+        {kBytes, 0, 0x40201080, {10, 10, 10, 100}, 0, {49, 29, 20, 178}, "byte image destination-over"},
+        {kBytes, 1, 0x40201080, {5, 5, 5, 0}, 0, {64, 32, 16, 128}, "flag: over alpha 0 the source as it is"},
+        {kBytes, 0, 0x40201080, {5, 5, 5, 0}, 0, {69, 37, 21, 128}, "no flag: colour under alpha 0 summed in"},
+        {kOverwrite, 0, 0x80112233, {9, 9, 9, 9}, 200, {0x11, 0x22, 0x33, 100}, "overwrite: colour unscaled"},
     };
-    for (const auto& c : cases) {
-        EXPECT_EQ(c.words ? Words(c.mode, c.color, c.dst) : Mode(c.mode, c.color, c.dst, c.m), c.expected) << c.why;
-    }
-}
-
-TEST(BlenderRules, UnknownModesDrawNothing) {
+    for (const auto& c : cases) EXPECT_EQ(Draw(c.source, c.mode, c.color, c.dst, c.m), c.expected) << c.rule;
     for (int mode : {0, 4, 5, 6, 8, -1, 1000})
-        EXPECT_EQ(Mode(mode, 0xFFFFFFFF, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4})) << mode;
+        EXPECT_EQ(Draw(kCoverage, mode, ~0u, Px{1, 2, 3, 4}, 255), (Px{1, 2, 3, 4})) << "unknown mode " << mode;
 }
 
 TEST(BlenderRules, OnlyTheTwoDestinationOverModesLog) {
     Testing::LogCapture log;
-    for (int mode : {1, 2, 3, 7, 4}) Mode(mode, 0xFF000000, Px{0, 0, 0, 0}, 1);
+    for (int mode : {1, 2, 3, 7, 4}) Draw(kCoverage, mode, 0xFF000000, Px{0, 0, 0, 0}, 1);
     const auto lines = log.Lines();
     ASSERT_EQ(lines.size(), 2u);
-    EXPECT_EQ(lines[0].tag, "Blender");
-    EXPECT_EQ(lines[0].priority, 3);
     EXPECT_EQ(lines[0].message, "Blender - GxE_BLEND_DST_OVER_NSA");
     EXPECT_EQ(lines[1].message, "Blender - GxE_BLEND_OTHER");
 }
 
-TEST(BlenderRules, OverwriteKeepsColourUnscaled) {
-    auto draw = [](Px dst, uint8_t m) {
-        return Blend1(dst, m, [](GxBitmap* b, const uint8_t* s) {
-            GxBlender::drawBitmap(0, 0, b, s, 1, 1, 0x80112233);
-        });
-    };
-    EXPECT_EQ(draw(Px{9, 9, 9, 9}, 200), (Px{0x11, 0x22, 0x33, 100}));
-    EXPECT_EQ(draw(Px{9, 9, 9, 9}, 0), (Px{0x11, 0x22, 0x33, 0}));
-}
-
-TEST(BlenderRules, MaskUnionKeepsLargerCoverage) {
-    GxBitmap mask(3, 1, 1);
-    const uint8_t first[3] = {10, 200, 0};
-    const uint8_t second[3] = {50, 100, 7};
-    GxBlender::drawBitmap(0, 0, &mask, first, 3, 1, 0xFF000000);
-    GxBlender::drawBitmap(0, 0, &mask, second, 3, 1, 0xFF000000);
-    EXPECT_EQ(mask.pixels[0], 50);
-    EXPECT_EQ(mask.pixels[1], 200);
-    EXPECT_EQ(mask.pixels[2], 7);
-}
-
-TEST(BlenderRules, DestinationOverByteImageAndItsFlag) {
-    const uint8_t src[4] = {64, 32, 16, 128};  // R, G, B, A
-    auto draw = [&](Px dst, int flag) {
-        GxBitmap b(1, 1, 4);
-        Set(b, 0, 0, dst);
-        GxBlender::drawBitmapBlend32(0, 0, &b, src, 1, 1, 1, 0, flag);
-        return Get(b, 0, 0);
-    };
-    EXPECT_EQ(draw(Px{10, 10, 10, 100}, 0), (Px{49, 29, 20, 178}));
-    EXPECT_EQ(draw(Px{10, 10, 10, 100}, 1), (Px{49, 29, 20, 178}));
-    // Over alpha 0: the flag takes the source as it is; without it the
-    // colour left under alpha 0 is summed in.
-    EXPECT_EQ(draw(Px{5, 5, 5, 0}, 1), (Px{64, 32, 16, 128}));
-    EXPECT_EQ(draw(Px{5, 5, 5, 0}, 0), (Px{69, 37, 21, 128}));
-}
-
-TEST(BlenderRules, RedBlueSwapGivesJavaWords) {
-    GxBitmap b(2, 1, 4);
-    Set(b, 0, 0, Px{1, 2, 3, 4});
-    Set(b, 1, 0, Px{0xFF, 0x80, 0x00, 0x7F});
+TEST(BlenderRules, RedBlueSwapGivesJavaWordsAndLeavesMasksAlone) {
+    GxBitmap b(1, 1, 4), mask(2, 2, 1);
+    Set(b, 0, 0, Px{0xFF, 0x80, 0x00, 0x7F});
     GxBlender::convertBGRAToARGB(&b);
-    EXPECT_EQ(Get(b, 0, 0), (Px{3, 2, 1, 4}));
-    if constexpr (std::endian::native == std::endian::little) {
-        uint32_t word;
-        std::memcpy(&word, b.pixels + 4, 4);
-        EXPECT_EQ(word, 0x7FFF8000u);  // what Java reads: 0xAARRGGBB
-    }
-    GxBlender::convertBGRAToARGB(nullptr);
-    GxBitmap empty;
-    GxBlender::convertBGRAToARGB(&empty);
-    GxBitmap mask(2, 2, 1);
+    EXPECT_EQ(Get(b, 0, 0), (Px{0x00, 0x80, 0xFF, 0x7F})) << "little-endian Java reads the word 0x7FFF8000";
     mask.pixels[0] = 1;
-    mask.pixels[2] = 3;
-    GxBlender::convertBGRAToARGB(&mask);  // not a colour image: untouched
-    EXPECT_EQ(mask.pixels[0], 1);
-    EXPECT_EQ(mask.pixels[2], 3);
+    GxBlender::convertBGRAToARGB(&mask);
+    GxBlender::convertBGRAToARGB(nullptr);
+    EXPECT_EQ(mask.pixels[0], 1) << "a mask was treated as a colour image";
 }
 
 // --- clipping
@@ -188,35 +120,20 @@ TEST(BlenderClip, EachEdgeEntersTheSourceAtTheRightPlace) {
     };
     using V = std::vector<int>;
     EXPECT_EQ(run(0, 0), (V{1, 2, 3, 0, 11, 12, 13, 0, 0, 0, 0, 0}));
-    // Negative x and y: only the bottom-right part shows, from (1, 1) on.
     EXPECT_EQ(run(-1, -1), (V{12, 13, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0}));
-    // Right and bottom edges: the source's top-left lands in the corner.
     EXPECT_EQ(run(3, 2), (V{0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 1}));
     EXPECT_EQ(run(2, -1), (V{0, 0, 11, 12, 0, 0, 0, 0, 0, 0, 0, 0}));
     // Wholly outside on every side, and placements that would overflow.
     for (auto [x, y] : std::vector<std::pair<int, int>>{{4, 0}, {0, 3}, {-3, 0}, {0, -2}, {INT_MAX, 0},
                                                          {0, INT_MAX}, {INT_MIN, INT_MIN}})
-        EXPECT_EQ(run(x, y), V(12, 0)) << x << "," << y;
-}
+        EXPECT_EQ(run(x, y), V(12, 0)) << "drawn at " << x << "," << y;
 
-TEST(BlenderClip, ImageSourcesClipLikeMasks) {
-    // 3x2 words, row length 3; alpha byte = index + 1, opaque colour 0.
-    uint32_t src[6];
-    for (int i = 0; i < 6; ++i) src[i] = uint32_t(i + 1) << 24;
+    // Image sources clip alike: 3x2 words, alpha = index + 1.
+    uint32_t words[6];
+    for (int i = 0; i < 6; ++i) words[i] = uint32_t(i + 1) << 24;
     GxBitmap b(2, 2, 4);
-    GxBlender::drawBitmapBlend32(-1, 1, &b, src, 3, 2, 3, 2);
-    EXPECT_EQ(Get(b, 0, 0)[3], 0);
-    EXPECT_EQ(Get(b, 1, 0)[3], 0);
-    EXPECT_EQ(Get(b, 0, 1)[3], 2);
-    EXPECT_EQ(Get(b, 1, 1)[3], 3);
-
-    uint8_t bytes[24] = {};
-    for (int i = 0; i < 6; ++i) bytes[i * 4 + 3] = uint8_t(i + 1);
-    GxBitmap c(2, 2, 4);
-    GxBlender::drawBitmapBlend32(1, -1, &c, bytes, 3, 2, 3, 0, 1);
-    EXPECT_EQ(Get(c, 1, 0)[3], 4);
-    EXPECT_EQ(Get(c, 0, 0)[3], 0);
-    EXPECT_EQ(Get(c, 1, 1)[3], 0);
+    GxBlender::drawBitmapBlend32(-1, 1, &b, words, 3, 2, 3, 2);
+    EXPECT_EQ((V{Get(b, 0, 0)[3], Get(b, 1, 0)[3], Get(b, 0, 1)[3], Get(b, 1, 1)[3]}), (V{0, 0, 2, 3}));
 }
 
 TEST(BlenderClip, MissingOrMismatchedInputsAreNoOps) {
@@ -233,30 +150,22 @@ TEST(BlenderClip, MissingOrMismatchedInputsAreNoOps) {
     }
     GxBlender::drawBitmapBlend32(0, 0, &mask, &word, 1, 1, 1, 1);
     GxBlender::drawBitmap(0, 0, &color, &empty, 0);
-    EXPECT_EQ(Get(color, 0, 0), (Px{0, 0, 0, 0}));
-    EXPECT_EQ(mask.pixels[0], 0);
+    EXPECT_TRUE(Get(color, 0, 0) == (Px{0, 0, 0, 0}) && mask.pixels[0] == 0) << "a refused input drew";
 }
-
-// --- properties over every input
 
 TEST(BlenderProperties, DestinationOverNeverChangesAnOpaquePixel) {
     GxBitmap b(256, 1, 4);
-    std::vector<uint8_t> m(256);
+    std::vector<uint8_t> m(256), full(256, 255);
     std::vector<uint32_t> words(256);
-    for (int i = 0; i < 256; ++i) {
-        Set(b, i, 0, Px{i, 255 - i, i / 2, 255});
-        m[i] = uint8_t(i);
-        words[i] = uint32_t(i) * 0x01010101u;
-    }
+    for (int i = 0; i < 256; ++i)
+        Set(b, i, 0, Px{i, 255 - i, i / 2, 255}), m[i] = uint8_t(i), words[i] = uint32_t(i) * 0x01010101u;
     std::vector<uint8_t> before(b.pixels, b.pixels + 256 * 4);
     for (unsigned color : {0xFFFFFFFFu, 0x80402010u, 0x01FF00FFu}) {
         for (int mode : {2, 3}) GxBlender::drawBitmapBlend8(0, 0, &b, m.data(), 256, 1, 256, color, mode);
-        // Full coverage of the text fill keeps the destination too.
-        std::vector<uint8_t> full(256, 255);
-        GxBlender::drawBitmapBlend8(0, 0, &b, full.data(), 256, 1, 256, color, 7);
+        GxBlender::drawBitmapBlend8(0, 0, &b, full.data(), 256, 1, 256, color, 7);  // the fill at full coverage
     }
     GxBlender::drawBitmapBlend32(0, 0, &b, words.data(), 256, 1, 256, 2);
-    EXPECT_EQ(std::vector<uint8_t>(b.pixels, b.pixels + 256 * 4), before);
+    EXPECT_EQ(std::vector<uint8_t>(b.pixels, b.pixels + 256 * 4), before) << "an opaque pixel changed";
 }
 
 }  // namespace

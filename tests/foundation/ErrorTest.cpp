@@ -10,48 +10,34 @@
 namespace Glimmer {
 namespace {
 
-TEST(Error, SlotIsPerThread) {
+// The code and the reason are the calling thread's own; reporting logs the
+// code and the source line under the tag and leaves the code's phrase.
+TEST(Error, ReportLogsUnderTheTagAndEachThreadKeepsItsOwnCodeAndReason) {
     Error::SetError(kErrorNotFound);
-    int otherBefore = -1;
-    int otherAfter = -1;
-    std::thread other([&] {
-        otherBefore = Error::GetError();
-        Error::SetError(kErrorFileOpen);
-        otherAfter = Error::GetError();
-    });
-    other.join();
-    EXPECT_EQ(otherBefore, 0);
-    EXPECT_EQ(otherAfter, 11);
-    EXPECT_EQ(Error::GetError(), 9);
-}
-
-TEST(Error, ReasonIsPerThreadAndReportingACodeSetsItsPhrase) {
     Error::SetReason("%s: %d", "first", 1);
-    std::string other;
+    Testing::LogCapture capture;
+    int line = 0, otherBefore = -1;
+    std::string reasonBefore = "?";
     std::thread([&] {
-        other = Error::GetReason();
-        GX_REPORT_ERROR("GxTest", kErrorNotBound);
-        EXPECT_STREQ(Error::GetReason(), (std::string("error 19: ") + ReasonOfCode(kErrorNotBound)).c_str());
+        otherBefore = Error::GetError();
+        reasonBefore = Error::GetReason();
+        GX_REPORT_ERROR("GxString", kErrorNotBound);
+        line = __LINE__ - 1;
+        EXPECT_EQ(Error::GetError(), 19);
+        EXPECT_EQ(Error::GetReason(), std::string("error 19: ") + ReasonOfCode(kErrorNotBound));
     }).join();
-    EXPECT_EQ(other, "");
+    EXPECT_EQ(otherBefore, 0);
+    EXPECT_EQ(reasonBefore, "");
+    EXPECT_EQ(Error::GetError(), 9);
     EXPECT_STREQ(Error::GetReason(), "first: 1");
+    ASSERT_EQ(capture.Lines().size(), 1u);
+    EXPECT_EQ(capture.Lines()[0].priority, 6);
+    EXPECT_EQ(capture.Lines()[0].tag, "GxString");
+    EXPECT_EQ(capture.Lines()[0].message, "@ Native Error 19 : " + std::to_string(line));
+
     // A long reason is cut, never overrun.
     Error::SetReason("%s", std::string(5000, 'x').c_str());
     EXPECT_EQ(std::strlen(Error::GetReason()), size_t(Error::kMaxReasonBytes - 1));
-    Error::ClearReason();
-    EXPECT_STREQ(Error::GetReason(), "");
-}
-
-TEST(Error, ReportLogsCodeAndLineUnderTag) {
-    Testing::LogCapture capture;
-    GX_REPORT_ERROR("GxString", kErrorAlreadyConstructed);
-    const int line = __LINE__ - 1;
-    EXPECT_EQ(Error::GetError(), 4);
-    auto lines = capture.Lines();
-    ASSERT_EQ(lines.size(), 1u);
-    EXPECT_EQ(lines[0].priority, 6);
-    EXPECT_EQ(lines[0].tag, "GxString");
-    EXPECT_EQ(lines[0].message, "@ Native Error 4 : " + std::to_string(line));
 }
 
 }  // namespace

@@ -78,11 +78,6 @@ Font Measure(const std::string& path) {
 
 }  // namespace
 
-#if defined(__SANITIZE_ADDRESS__)
-// fontconfig 2.14 loses a few hundred bytes inside FcInit, once per process.
-extern "C" const char* __lsan_default_suppressions() { return "leak:libfontconfig.so\n"; }
-#endif
-
 int main(int argc, char** argv) {
     if (argc != 3) {
         std::fprintf(stderr, "usage: %s TABLE RENDERER\n", argv[0]);

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
 #include <vector>
 
@@ -11,77 +12,34 @@ namespace {
 using Pixel = std::array<uint8_t, 4>;
 
 struct Image {
-    Image(int w, int h, Pixel fill) : width(w), height(h), bytes(size_t(w) * size_t(h) * 4) {
+    Image(int w, int h, Pixel fill) : width(w), bytes(size_t(w) * size_t(h) * 4) {
         for (int i = 0; i < w * h; ++i) std::copy(fill.begin(), fill.end(), bytes.begin() + i * 4);
     }
     Pixel At(int x, int y) const {
         const uint8_t* p = &bytes[(size_t(y) * size_t(width) + size_t(x)) * 4];
         return {p[0], p[1], p[2], p[3]};
     }
-    int width, height;
+    int width;
     std::vector<uint8_t> bytes;
 };
 
-TEST(CanvasTest, FillsPixelsWhoseCentresAreInsideInRgbaOrder) {
-    Image image(4, 3, {0, 0, 0, 0});
-    Canvas canvas(image.bytes.data(), 4, 3);
-    canvas.FillRect(0.5f, 0.0f, 2.5f, 1.0f, 0xFF102030u);
-    EXPECT_EQ(image.At(0, 0), (Pixel{0x10, 0x20, 0x30, 0xFF}));
-    EXPECT_EQ(image.At(1, 0), (Pixel{0x10, 0x20, 0x30, 0xFF}));
-    EXPECT_EQ(image.At(2, 0), (Pixel{0, 0, 0, 0}));   // centre 2.5 is on the right edge
-    EXPECT_EQ(image.At(0, 1), (Pixel{0, 0, 0, 0}));
-}
-
-TEST(CanvasTest, ClipNarrowsEveryLaterDrawingAndClearIgnoresIt) {
-    Image image(4, 2, {1, 2, 3, 4});
-    Canvas canvas(image.bytes.data(), 4, 2);
-    canvas.ClipRect(1, 0, 3, 2);
-    canvas.ClipRect(0, 1, 4, 2);   // intersects: columns 1..2, row 1
-    canvas.FillRect(-10.0f, -10.0f, 10.0f, 10.0f, 0xFFFFFFFFu);
-    EXPECT_EQ(image.At(0, 1), (Pixel{1, 2, 3, 4}));
-    EXPECT_EQ(image.At(1, 0), (Pixel{1, 2, 3, 4}));
-    EXPECT_EQ(image.At(1, 1), (Pixel{255, 255, 255, 255}));
-    EXPECT_EQ(image.At(2, 1), (Pixel{255, 255, 255, 255}));
-    EXPECT_EQ(image.At(3, 1), (Pixel{1, 2, 3, 4}));
-    canvas.Clear();
-    EXPECT_EQ(image.At(0, 0), (Pixel{0, 0, 0, 0}));
-}
-
 // Straight-alpha source-over, values worked out by hand.
 TEST(CanvasTest, DrawImageBlendsStraightAlphaSourceOver) {
-    struct Case {
+    const struct {
         Pixel dst, src, expected;
+    } cases[] = {
+        {{0, 0, 0, 255}, {200, 100, 50, 128}, {100, 50, 25, 255}},   // over opaque black
+        {{9, 9, 9, 0}, {200, 100, 50, 128}, {200, 100, 50, 128}},    // over nothing
+        {{0, 0, 255, 128}, {255, 0, 0, 128}, {170, 0, 85, 192}},     // half over half
+        {{7, 8, 9, 10}, {200, 100, 50, 0}, {7, 8, 9, 10}},           // transparent source
+        {{7, 8, 9, 10}, {200, 100, 50, 255}, {200, 100, 50, 255}},   // opaque source
     };
-    const Case cases[] = {
-        {{0, 0, 0, 255}, {200, 100, 50, 128}, {100, 50, 25, 255}},      // over opaque black
-        {{9, 9, 9, 0}, {200, 100, 50, 128}, {200, 100, 50, 128}},       // over nothing
-        {{0, 0, 255, 128}, {255, 0, 0, 128}, {170, 0, 85, 192}},         // half over half
-        {{7, 8, 9, 10}, {200, 100, 50, 0}, {7, 8, 9, 10}},               // transparent source
-        {{7, 8, 9, 10}, {200, 100, 50, 255}, {200, 100, 50, 255}},       // opaque source
-    };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         Image dst(1, 1, c.dst);
         Image src(1, 1, c.src);
-        Canvas canvas(dst.bytes.data(), 1, 1);
-        canvas.DrawImage(src.bytes.data(), 1, 1, 0, 0);
+        Canvas(dst.bytes.data(), 1, 1).DrawImage(src.bytes.data(), 1, 1, 0, 0);
         EXPECT_EQ(dst.At(0, 0), c.expected);
     }
-}
-
-TEST(CanvasTest, DrawImageAtAnOffsetDrawsOnlyItsVisiblePart) {
-    Image dst(3, 3, {0, 0, 0, 0});
-    Image src(2, 2, {0, 0, 0, 0});
-    src.bytes[0 * 4 + 3] = 255;            // (0, 0)
-    src.bytes[1 * 4 + 0] = 11;             // (1, 0)
-    src.bytes[1 * 4 + 3] = 255;
-    src.bytes[3 * 4 + 0] = 22;             // (1, 1)
-    src.bytes[3 * 4 + 3] = 255;
-    Canvas canvas(dst.bytes.data(), 3, 3);
-    canvas.DrawImage(src.bytes.data(), 2, 2, -1, 1);
-    EXPECT_EQ(dst.At(0, 1), (Pixel{11, 0, 0, 255}));
-    EXPECT_EQ(dst.At(0, 2), (Pixel{22, 0, 0, 255}));
-    EXPECT_EQ(dst.At(1, 1), (Pixel{0, 0, 0, 0}));
-    EXPECT_EQ(dst.At(0, 0), (Pixel{0, 0, 0, 0}));
 }
 
 // The text object relies on this when there is no background: drawing a
@@ -91,16 +49,11 @@ TEST(CanvasTest, DrawingOntoClearedPixelsEqualsClearingOutsideTheClip) {
     const int w = 64, h = 5;
     Image picture(w, h, {0, 0, 0, 0});
     uint32_t seed = 12345;
-    for (size_t i = 0; i < picture.bytes.size(); ++i) {
-        seed = seed * 1664525u + 1013904223u;
-        picture.bytes[i] = uint8_t(seed >> 24);
-    }
+    for (uint8_t& byte : picture.bytes) byte = uint8_t((seed = seed * 1664525u + 1013904223u) >> 24);
+    for (int i = 0; i < 256; ++i) picture.bytes[size_t(i) * 4 + 3] = uint8_t(i);   // every alpha
     for (int i = 0; i < w * h; ++i) {
-        uint8_t* p = &picture.bytes[size_t(i) * 4];
-        if (i < 256) p[3] = uint8_t(i);  // every alpha
-        if (p[3] == 0) p[0] = p[1] = p[2] = 0;
+        if (picture.bytes[size_t(i) * 4 + 3] == 0) std::fill_n(&picture.bytes[size_t(i) * 4], 3, 0);
     }
-
     Image drawn(w, h, {7, 7, 7, 7});
     Canvas onto(drawn.bytes.data(), w, h);
     onto.Clear();
@@ -111,7 +64,7 @@ TEST(CanvasTest, DrawingOntoClearedPixelsEqualsClearingOutsideTheClip) {
     Canvas in(kept.bytes.data(), w, h);
     in.ClipRect(3, 1, 60, 4);
     in.ClearOutsideClip();
-    EXPECT_EQ(drawn.bytes, kept.bytes);
+    EXPECT_TRUE(drawn.bytes == kept.bytes) << "drawing onto cleared pixels changed the picture";
     EXPECT_EQ(kept.At(2, 2), (Pixel{0, 0, 0, 0}));
 }
 

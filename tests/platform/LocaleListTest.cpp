@@ -10,35 +10,28 @@ namespace {
 
 using Tags = std::vector<std::string>;
 
-TEST(LocaleListTest, EmptyAndMalformedListsAreIdZero) {
-    EXPECT_EQ(RegisterLocaleList(nullptr), kEmptyLocaleListId);
-    EXPECT_EQ(RegisterLocaleList(""), kEmptyLocaleListId);
-    EXPECT_EQ(RegisterLocaleList(" , ,"), kEmptyLocaleListId);
-    EXPECT_EQ(RegisterLocaleList("1234,-,x"), kEmptyLocaleListId);
-    EXPECT_EQ(GetLocaleList(kEmptyLocaleListId), Tags());
-}
-
-TEST(LocaleListTest, TagsAreNormalisedBeforeTheyAreCompared) {
-    uint32_t ja = RegisterLocaleList("ja-JP");
-    EXPECT_NE(ja, kEmptyLocaleListId);
-    EXPECT_EQ(RegisterLocaleList("ja_jp"), ja);
+TEST(LocaleListTest, TagsAreNormalisedAndTheSameListKeepsItsId) {
+    const struct {
+        const char* list;
+        Tags tags;
+    } cases[] = {
+        {nullptr, {}},
+        {" , ,", {}},
+        {"1234,-,x", {}},
+        {"ja_jp", {"ja-JP"}},
+        {"ja-JP-u-ca-japanese", {"ja-JP"}},   // extensions dropped
+        {"ZH-hans-cn", {"zh-Hans-CN"}},
+        {"es-419", {"es-419"}},
+        {"en-US, 12, fr ,en_us", {"en-US", "fr"}},   // repeats and bad tags go; order stays
+    };
+    for (const auto& c : cases) {
+        const uint32_t id = RegisterLocaleList(c.list);
+        EXPECT_EQ(GetLocaleList(id), c.tags) << (c.list != nullptr ? c.list : "(null)");
+        EXPECT_EQ(id == kEmptyLocaleListId, c.tags.empty()) << (c.list != nullptr ? c.list : "(null)");
+    }
+    const uint32_t ja = RegisterLocaleList("ja-JP");
     EXPECT_EQ(RegisterLocaleList("  JA-jp "), ja);
-    EXPECT_EQ(RegisterLocaleList("ja-JP-u-ca-japanese"), ja);   // extensions dropped
-    EXPECT_EQ(GetLocaleList(ja), Tags({"ja-JP"}));
-
-    EXPECT_EQ(GetLocaleList(RegisterLocaleList("ZH-hans-cn")), Tags({"zh-Hans-CN"}));
-    EXPECT_EQ(GetLocaleList(RegisterLocaleList("und-Arab")), Tags({"und-Arab"}));
-    EXPECT_EQ(GetLocaleList(RegisterLocaleList("es-419")), Tags({"es-419"}));
-    // Repeats and bad tags go; order stays.
-    EXPECT_EQ(GetLocaleList(RegisterLocaleList("en-US, 12, fr ,en_us")), Tags({"en-US", "fr"}));
-}
-
-TEST(LocaleListTest, NewListsGetNewIdsAndUnknownIdsHaveNoTags) {
-    uint32_t first = RegisterLocaleList("de-AT");
-    uint32_t second = RegisterLocaleList("de-CH");
-    EXPECT_GT(second, first);
-    EXPECT_NE(RegisterLocaleList("de-AT,de-CH"), first);
-    EXPECT_EQ(RegisterLocaleList("de-AT"), first);
+    EXPECT_GT(RegisterLocaleList("ja-JP,de-CH"), ja);   // a new list, a new id
     EXPECT_EQ(GetLocaleList(0xFFFFFFF0u), Tags());
 }
 

@@ -29,18 +29,12 @@ public:
     }
     // Lines under `tag` whose message equals `message`.
     int Count(const std::string& tag, const std::string& message) const {
-        int n = 0;
-        for (const LogLine& line : Lines()) n += (line.tag == tag && line.message == message);
-        return n;
+        return CountIf([&](const LogLine& line) { return line.tag == tag && line.message == message; });
     }
     // Error reports ("@ Native Error <code> : ...") at error priority under `tag`.
     int CountErrors(const std::string& tag, int code) const {
         const std::string prefix = "@ Native Error " + std::to_string(code) + " : ";
-        int n = 0;
-        for (const LogLine& line : Lines()) {
-            n += line.tag == tag && line.priority == 6 && line.message.rfind(prefix, 0) == 0;
-        }
-        return n;
+        return CountIf([&](const LogLine& l) { return l.tag == tag && l.priority == 6 && l.message.rfind(prefix, 0) == 0; });
     }
     void Clear() {
         std::lock_guard<std::mutex> lock(mutex_);
@@ -48,6 +42,12 @@ public:
     }
 
 private:
+    template <typename Pred>
+    int CountIf(Pred pred) const {
+        int n = 0;
+        for (const LogLine& line : Lines()) n += pred(line);
+        return n;
+    }
     static void Receive(int priority, const char* tag, const char* message, void* self) {
         auto* capture = static_cast<LogCapture*>(self);
         std::lock_guard<std::mutex> lock(capture->mutex_);

@@ -15,8 +15,3 @@ public:
     ::testing::AddGlobalTestEnvironment(new SystemFonts);
 
 }  // namespace
-
-// fontconfig 2.14 loses a few hundred bytes while parsing its XML
-// configuration (once per process, inside FcInit); without frame pointers in
-// the library the leak's stack stops at it, so it is matched by library.
-extern "C" const char* __lsan_default_suppressions() { return "leak:libfontconfig.so\n"; }

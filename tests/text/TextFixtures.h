@@ -1,12 +1,15 @@
 #pragma once
-// Fonts and helpers shared by the text, font and platform tests. The fonts
-// are Debian's (fonts-dejavu-core, fonts-noto-core, fonts-noto-cjk,
-// fonts-noto-color-emoji); tests
-// check properties of what they draw, never exact bytes of a font version.
+// Fonts and helpers shared by the text, font, platform and foundation tests.
+// The fonts are Debian's (fonts-dejavu-core, fonts-noto-core, fonts-noto-cjk,
+// fonts-noto-color-emoji); tests check properties of what they draw, never
+// exact bytes of a font version (the picture table does that, by hash).
+
+#include <stdlib.h>
 
 #include <algorithm>
-#include <cstdio>
-#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <string>
 #include <vector>
 
@@ -18,14 +21,8 @@ inline const char* kNotoCjk = "/usr/share/fonts/opentype/noto/NotoSansCJK-Regula
 inline const char* kNotoColorEmoji = "/usr/share/fonts/truetype/noto/NotoColorEmoji.ttf";   // colour strikes
 
 inline std::vector<char> ReadFile(const char* path) {
-    std::vector<char> bytes;
-    FILE* file = std::fopen(path, "rb");
-    if (file == nullptr) return bytes;
-    char chunk[65536];
-    size_t n;
-    while ((n = std::fread(chunk, 1, sizeof chunk, file)) > 0) bytes.insert(bytes.end(), chunk, chunk + n);
-    std::fclose(file);
-    return bytes;
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
 }
 
 // A new[] copy, the form the font manager takes bytes in.
@@ -35,33 +32,26 @@ inline char* NewArray(const std::vector<char>& bytes) {
     return copy;
 }
 
-// A scratch folder, removed with its files.
+// A scratch folder, removed with everything in it.
 class TempDir {
 public:
     TempDir() {
-        char pattern[] = "/tmp/glimmer-text-XXXXXX";
-        const char* made = mkdtemp(pattern);
-        path_ = made != nullptr ? made : "/tmp";
+        char pattern[] = "/tmp/glimmer-test-XXXXXX";
+        if (mkdtemp(pattern) != nullptr) path_ = pattern;
     }
     ~TempDir() {
-        for (const std::string& file : files_) std::remove(file.c_str());
-        std::remove(path_.c_str());
+        std::error_code ignored;
+        if (!path_.empty()) std::filesystem::remove_all(path_, ignored);
     }
-    std::string Write(const char* name, const std::vector<char>& bytes) {
-        std::string file = path_ + "/" + name;
-        FILE* out = std::fopen(file.c_str(), "wb");
-        if (out != nullptr) {
-            if (!bytes.empty()) std::fwrite(bytes.data(), 1, bytes.size(), out);
-            std::fclose(out);
-        }
-        files_.push_back(file);
+    std::string Write(const char* name, const std::vector<char>& bytes) const {
+        const std::string file = path_ + "/" + name;
+        std::ofstream(file, std::ios::binary).write(bytes.data(), std::streamsize(bytes.size()));
         return file;
     }
     const std::string& Path() const { return path_; }
 
 private:
     std::string path_;
-    std::vector<std::string> files_;
 };
 
 }  // namespace Glimmer::Testing

@@ -283,7 +283,11 @@ Command ParseCommandLine(const std::vector<std::string>& args) {
 }
 
 void ReadJsonFile(const std::string& path, Command* command) {
-    const std::vector<char> bytes = ReadFileBytes(path, "--effects");
+    const std::vector<char> bytes = ReadFileBytes(path, "--effects", kMaxJsonBytes);
+    ReadJsonText(std::string_view(bytes.data(), bytes.size()), path, command);
+}
+
+void ReadJsonText(std::string_view bytes, const std::string& path, Command* command) {
     nlohmann::json document;
     try {
         document = nlohmann::json::parse(bytes.begin(), bytes.end());

@@ -4,6 +4,7 @@
 // given either way and --help lists them all with their defaults.
 
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "Renderer.h"
@@ -26,6 +27,9 @@ Command ParseCommandLine(const std::vector<std::string>& args);
 // of effects or an object whose "effects" member is that array and whose
 // other members are options by their long names.
 void ReadJsonFile(const std::string& path, Command* command);
+// The same from the file's bytes; `path` names it in messages and anchors
+// relative paths in it.
+void ReadJsonText(std::string_view bytes, const std::string& path, Command* command);
 
 std::string HelpText();
 

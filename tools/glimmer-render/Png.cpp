@@ -40,16 +40,11 @@ const char* WriteRows(FILE* file, png_bytep* rows, png_uint_32 width, png_uint_3
 }  // namespace
 
 Image ReadPng(const std::string& path, std::string_view what, int maxSide) {
-    FILE* probe = std::fopen(path.c_str(), "rb");
-    if (probe == nullptr) {
-        throw RenderError(std::string(what) + ": cannot read " + Quote(path) + ": " + std::strerror(errno));
-    }
-    std::fclose(probe);
-
+    const std::vector<char> file = ReadFileBytes(path, what, kMaxPngBytes);
     png_image png;
     std::memset(&png, 0, sizeof png);
     png.version = PNG_IMAGE_VERSION;
-    if (!png_image_begin_read_from_file(&png, path.c_str())) {
+    if (!png_image_begin_read_from_memory(&png, file.data(), file.size())) {
         throw RenderError(std::string(what) + ": " + Quote(path) + " is not a PNG file (" + png.message + ")");
     }
     if (png.width == 0 || png.height == 0 || png.width > png_uint_32(maxSide) ||

@@ -1,5 +1,7 @@
 #include "Values.h"
 
+#include "api/FileBytes.h"
+
 #include <algorithm>
 #include <cerrno>
 #include <charconv>
@@ -190,20 +192,13 @@ std::vector<glimmer::ColorStop> ParseStops(std::string_view text, std::string_vi
     return stops;
 }
 
-std::vector<char> ReadFileBytes(const std::string& path, std::string_view what) {
-    FILE* file = std::fopen(path.c_str(), "rb");
-    if (file == nullptr) {
-        throw RenderError(std::string(what) + ": cannot read " + Quote(path) + ": " + std::strerror(errno));
-    }
-    std::vector<char> bytes;
-    char chunk[65536];
-    size_t n = 0;
-    while ((n = std::fread(chunk, 1, sizeof chunk, file)) > 0) bytes.insert(bytes.end(), chunk, chunk + n);
-    const bool failed = std::ferror(file) != 0;
-    std::fclose(file);
-    if (failed) throw RenderError(std::string(what) + ": cannot read " + Quote(path));
-    if (bytes.empty()) throw RenderError(std::string(what) + ": " + Quote(path) + " is empty");
-    return bytes;
+std::vector<char> ReadFileBytes(const std::string& path, std::string_view what, size_t maxBytes) {
+    // The library's own reader: regular files only, opened without blocking
+    // and read up to the limit, so a FIFO or a device cannot hang or flood us.
+    glimmer::detail::FileBytes file = glimmer::detail::ReadFileBytes(path, maxBytes);
+    if (!file.error.empty()) throw RenderError(std::string(what) + ": " + file.error);
+    if (file.bytes.empty()) throw RenderError(std::string(what) + ": " + Quote(path) + " is empty");
+    return std::move(file.bytes);
 }
 
 }  // namespace Glimmer::RenderTool

@@ -48,7 +48,12 @@ std::string ColorNames();
 // are given for every stop or for none, and then spread evenly.
 std::vector<glimmer::ColorStop> ParseStops(std::string_view text, std::string_view what);
 
-// Reads a whole file; a RenderError naming `what` when it cannot.
-std::vector<char> ReadFileBytes(const std::string& path, std::string_view what);
+// Reads a whole regular file of at most `maxBytes`; a RenderError naming
+// `what` when it cannot (a FIFO or device is refused at once).
+std::vector<char> ReadFileBytes(const std::string& path, std::string_view what, size_t maxBytes);
+
+// Limits of the files the renderer reads.
+inline constexpr size_t kMaxJsonBytes = size_t(16) << 20;
+inline constexpr size_t kMaxPngBytes = size_t(256) << 20;   // a 4096 x 4096 tile, stored without compression
 
 }  // namespace Glimmer::RenderTool

@@ -1,8 +1,11 @@
+// The root table against its decimal definition, and the Gaussian weights.
+
 #include <gtest/gtest.h>
 
 #include <cmath>
 #include <cstdio>
 #include <cstdlib>
+#include <vector>
 
 #include "effect/filters/GxGaussian.h"
 #include "effect/filters/GxSqrt.h"
@@ -20,44 +23,25 @@ float DecimalSqrt(int i) {
 }
 
 TEST(SqrtTable, MatchesThreeDecimalRoundingInsideAndBeyondTheTable) {
-    EXPECT_EQ(GX_INT_SQRT_TABLE[0], 0.0f);
-    EXPECT_EQ(GX_INT_SQRT_TABLE[2], 1.414f);
-    EXPECT_EQ(GX_INT_SQRT_TABLE[5489], 74.088f);
-    for (int i = 0; i < kIntSqrtTableSize; ++i) ASSERT_EQ(GX_INT_SQRT_TABLE[i], DecimalSqrt(i)) << i;
+    for (int i = 0; i < kIntSqrtTableSize; ++i) ASSERT_EQ(GX_INT_SQRT_TABLE[i], DecimalSqrt(i)) << "table entry " << i;
     // Past the end: the value a longer table would hold (relief sizes up to 100+).
     for (int i = kIntSqrtTableSize; i < 2 * 110 * 110; i += 7) ASSERT_EQ(IntSqrt(i), DecimalSqrt(i)) << i;
     EXPECT_EQ(IntSqrt(-1), 0.0f);
-}
-
-TEST(SqrtTable, FastSqrtIsTheOneNewtonStepApproximation) {
-    // Bit patterns of the approximation, not of the true root.
+    // The one-Newton-step root: these bit patterns, not the true root's.
     EXPECT_EQ(fsqrt(4.0f), 1.99661434f);
     EXPECT_EQ(fsqrt(1.0f), 0.998307168f);
-    for (float x : {0.5f, 2.0f, 10.0f, 1000.0f, 1e6f}) {
-        EXPECT_NEAR(fsqrt(x), std::sqrt(x), std::sqrt(x) * 0.002f);
-        EXPECT_NE(fsqrt(x), std::sqrt(x));
-    }
 }
 
 TEST(GaussianWeights, CentreAndRoundingVariants) {
-    int w[8];
+    int w[101];
     int sum = 0;
     ComputeGaussianWeights(w, &sum, 3, kShadowGaussianCentre, GaussianRounding::kDouble);
-    EXPECT_EQ(w[0], 100);
-    EXPECT_EQ(w[1], 60);
-    EXPECT_EQ(w[2], 13);
-    EXPECT_EQ(w[3], 1);
-    EXPECT_EQ(sum, 248);
-
+    EXPECT_EQ((std::vector<int>{w[0], w[1], w[2], w[3], sum}), (std::vector<int>{100, 60, 13, 1, 248}));
     ComputeGaussianWeights(w, &sum, 0, kGlowGaussianCentre, GaussianRounding::kSingle);
-    EXPECT_EQ(w[0], 128);
-    EXPECT_EQ(sum, 128);
-
+    EXPECT_TRUE(w[0] == 128 && sum == 128);
     // The tail weight is 1% of the centre whatever the radius.
-    int big[101];
-    ComputeGaussianWeights(big, &sum, 100, kGlowGaussianCentre, GaussianRounding::kDouble);
-    EXPECT_EQ(big[100], 1);
-    for (int i = 1; i <= 100; ++i) EXPECT_LE(big[i], big[i - 1]);
+    ComputeGaussianWeights(w, &sum, 100, kGlowGaussianCentre, GaussianRounding::kDouble);
+    EXPECT_EQ(w[100], 1);
 }
 
 }  // namespace

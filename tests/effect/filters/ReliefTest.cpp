@@ -1,11 +1,10 @@
-// The pieces bevel and emboss share (blur, distance transforms, the local
-// searches against their literal scans, the row kernels against theirs,
-// light, edge factor, plane writes, colouring, plane rotation), then
-// properties both layers must have.
+// Bevel and emboss: the kernels they share against their literal references
+// (blur, distance transforms, local searches, row kernels), the layers'
+// radii, margins and refusals, and their blend modes. Their pixels are pinned
+// by the picture table.
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <array>
 #include <cmath>
 #include <cstring>
@@ -22,28 +21,70 @@
 namespace Glimmer {
 namespace {
 
-using namespace Testing;
+using Testing::RunLayer;
+using Testing::SamePixels;
 constexpr float kFar = 1e20f;
 
-TEST(ReliefKernels, BlurByHandAndAgainstTheFormula) {
-    // Radius 1: weights 100 and 1, total 102. One 255 pixel: vertical 250 at
-    // the centre and 2 above and below; horizontal 245 at the centre, 2 beside,
-    // 1 above and below. Nothing outside [1, 4) x [1, 4) is written.
-    std::vector<uint8_t> src(25, 0), dst(25, 0xAB);
-    src[12] = 255;
-    ASSERT_EQ(ReliefBlur(src.data(), dst.data(), 5, 1, 5), 0);
-    const std::vector<uint8_t> want = {171, 171, 171, 171, 171, 171, 0, 1, 0, 171, 171, 2, 245,
-                                       2,   171, 171, 0,   1,   0,   171, 171, 171, 171, 171, 171};
-    EXPECT_EQ(dst, want);
+struct ReliefParams {
+    int style, technique;
+    float size;
+    int soften;
+};
 
+ReliefParams Relief(int style, int technique, float size, int soften = 0) { return {style, technique, size, soften}; }
+
+// Depth 1, light from 120 degrees at 30, opaque blue highlights and red shades.
+template <typename Record>
+Record MakeRecord(const ReliefParams& p) {
+    return Record(p.style, 1.0f, p.size, 1, p.technique, p.soften, 1.0f, 120.0f, 30.0f, 0xFF0000FF, 1.0f,
+                  0xFFFF0000, 1.0f);
+}
+
+// A mask and a 32-bit target of the same size, with the text rectangle
+// `pad` pixels in from every side.
+struct ReliefCanvas {
+    ReliefCanvas(int textWidth, int textHeight, int pad)
+        : mask(textWidth + 2 * pad, textHeight + 2 * pad, 1), dst(textWidth + 2 * pad, textHeight + 2 * pad, 4),
+          rect(pad, pad, pad + textWidth, pad + textHeight) {}
+
+    template <typename Layer, typename Record>
+    void Run(const ReliefParams& p, int separateWorkImage = 0, GxBitmap* extra = nullptr) {
+        Record record = MakeRecord<Record>(p);
+        Layer layer;
+        layer.setProperty(&record);
+        RunLayer(layer, mask, dst, rect, separateWorkImage, extra);
+    }
+    uint8_t& Mask(int x, int y) { return mask.pixels[size_t(y) * mask.width + size_t(x)]; }
+    int DrawnPixels() const {
+        int n = 0;
+        for (size_t i = 3; i < size_t(dst.width) * dst.height * 4; i += 4) n += dst.pixels[i] != 0;
+        return n;
+    }
+    // Full coverage `inset` pixels in from the text rectangle's sides, with a
+    // one-pixel rim of 128.
+    void FillSquare(int inset) {
+        for (int y = rect.top + inset - 1; y < rect.bottom - inset + 1; ++y)
+            for (int x = rect.left + inset - 1; x < rect.right - inset + 1; ++x)
+                if (x >= 0 && y >= 0 && x < int(mask.width) && y < int(mask.height))
+                    Mask(x, y) = x < rect.left + inset || y < rect.top + inset || x >= rect.right - inset ||
+                                         y >= rect.bottom - inset ? 128 : 255;
+    }
+    GxBitmap mask, dst;
+    GxRect rect;
+};
+
+// ---- the shared kernels against their literal references
+
+TEST(ReliefKernels, BlurAgainstTheFormula) {
     std::mt19937 rng(7);
     // Dense planes, and wide ones of flat patches (tiles of columns that read
-    // one byte throughout are passed over): zeros, and other constants.
+    // one byte throughout are passed over): zeros, and other constants. The
+    // outputs start poisoned: nothing outside [r, w - r) x [r, h - r) is written.
     struct Plane { int r, w, h, flat; };
     for (Plane p : {Plane{2, 13, 10, -1}, Plane{5, 19, 16, -1}, Plane{16, 41, 38, -1}, Plane{3, 150, 12, 0},
                     Plane{9, 230, 40, 0}, Plane{0, 99, 9, 77}, Plane{1, 180, 30, 77}, Plane{7, 300, 45, 200}}) {
         const int r = p.r, w = p.w, h = p.h;
-        std::vector<uint8_t> in(size_t(w) * h), out(in.size(), 0), ref(in.size(), 0);
+        std::vector<uint8_t> in(size_t(w) * h), out(in.size(), 0xAB), ref(in.size(), 0xAB);
         for (auto& v : in) v = uint8_t(rng() % 4 == 0 ? 255 : rng() % 256);
         if (p.flat >= 0) {
             for (int y = 0; y < h; ++y)
@@ -71,7 +112,7 @@ TEST(ReliefKernels, BlurByHandAndAgainstTheFormula) {
                 ref[y * w + x] = uint8_t(std::min(acc / total, 255));
             }
         }
-        EXPECT_EQ(out, ref) << "radius " << r;
+        EXPECT_EQ(out, ref) << "the blur differs from the formula at radius " << r;
     }
 }
 
@@ -175,15 +216,7 @@ TEST(ReliefKernels, SearchesAgreeBitForBitWithTheLiteralScans) {
     std::vector<float> line = {8.0f, -5.0f, -5.0f};
     ReliefInwardDistance(line.data(), 3, 1, 1, 0, 1);
     EXPECT_EQ(line, (std::vector<float>{8.0f, 7.0f, 6.0f}));
-    // One source in a 60 x 60 corner: the far corner is at index 6962, past
-    // the root table's 5490 entries, and gets sqrt(6962) to three places.
-    std::vector<float> fast(3600, 100.0f);
-    fast[0] = 0.0f;
-    std::vector<float> slow = fast;
-    ReliefLocalDistance(fast.data(), 60, 60, 60, 0, 60, GxReliefTargets::kNonZero);
-    ReliefLocalDistanceReference(slow.data(), 60, 60, 60, 0, 60, GxReliefTargets::kNonZero);
-    EXPECT_EQ(fast, slow);
-    EXPECT_EQ(fast[3599], 83.439f);
+    // Roots past the table's 5490 entries are what a longer table would hold.
     GxReliefRoots roots(2 * 130 * 130);
     for (int i = 0; i < 2 * 130 * 130; i += 13) ASSERT_EQ(roots[i], IntSqrt(i)) << i;
 }
@@ -194,7 +227,6 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
     std::mt19937 rng(13);
     const auto variants = ReliefRows::Variants();
     ASSERT_FALSE(variants.empty());
-    const ReliefRows::Table& reference = ReliefRows::ReferenceTable();
     std::vector<int> widths;
     for (int n = 1; n <= 64; ++n) widths.push_back(n);
     widths.insert(widths.end(), {200, 1031});
@@ -217,6 +249,11 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
     auto same = [](const auto& a, const auto& b) {
         return a.size() == b.size() && std::memcmp(a.data(), b.data(), a.size() * sizeof(a[0])) == 0;
     };
+    struct Outputs {
+        std::vector<uint8_t> light[3][2], sides;
+        std::vector<float> swept, nearRow, inward;
+        std::vector<uint32_t> words, twoSided;
+    };
 
     for (int n : widths) {
         const size_t stride = size_t(n) + 2;
@@ -229,18 +266,10 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
         light.secondAlpha = int(rng() % 256);
         light.firstAlpha = int(rng() % 256);
         light.inside = rng() % 2;
-        const std::vector<float> outer = heights(3 * stride, light.range);
-        const std::vector<float> inner = heights(3 * stride, light.inRange);
+        const std::vector<float> outer = heights(3 * stride, light.range), inner = heights(3 * stride, light.inRange);
         const float* o = outer.data() + stride + 1;
         const float* in = inner.data() + stride + 1;
         const std::vector<uint8_t> second = bytes(size_t(n)), first = bytes(size_t(n));
-
-        std::vector<uint8_t> want[3][2];
-        for (int k = 0; k < 3; ++k) want[k][0] = second, want[k][1] = first;
-        reference.bevelLight(o, ptrdiff_t(stride), n, light, want[0][0].data(), want[0][1].data());
-        reference.embossHardLight(o, ptrdiff_t(stride), n, light, want[1][0].data(), want[1][1].data());
-        reference.embossSoftLight(o, in, ptrdiff_t(stride), n, light, want[2][0].data(), want[2][1].data());
-
         // A disc of radius r swept from a source near the row's middle or ends.
         const int r = 1 + int(rng() % 9);
         std::vector<int> chords(size_t(r) + 1);
@@ -257,23 +286,13 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
         const int sourceX = int(rng() % 3) == 0 ? 0 : int(rng() % n);
         const int left = int(rng() % (r + 2)), right = rng() % 4 == 0 ? 0 : r;
         const float amount = float(rng() % 100) / 101.0f;
-        std::vector<float> wantSwept = swept;
-        reference.sweepSource(wantSwept.data(), n, n, sourceX, r, 0, rows, left, right, disc, amount);
-
         const std::vector<float> sideRows = heights(3 * size_t(n), 1.5f);
         const bool positive = rng() % 2;
-        std::vector<uint8_t> wantSides = bytes(size_t(n));
-        const std::vector<uint8_t> sidesPoison = wantSides;
-        reference.sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive,
-                             wantSides.data());
-
+        const std::vector<uint8_t> sidesPoison = bytes(size_t(n));
         // A row of squared column distances and far entries, within a reach.
         const int reach = int(rng() % 13);
         std::vector<float> squares(size_t(n) + 2 * size_t(reach));
         for (float& v : squares) v = rng() % 5 == 0 ? 1e20f : float((rng() % 40) * (rng() % 40));
-        std::vector<float> wantNear(size_t(n), 7.0f);
-        reference.nearRow(squares.data() + reach, reach, n, wantNear.data());
-
         // The inward row: a padded plane of sources (values above 1 or -inf).
         const int ir = int(rng() % 5);
         const size_t plane = size_t(n) + 2 * size_t(ir);
@@ -284,291 +303,162 @@ TEST(ReliefKernels, EveryRowKernelGivesTheReferenceBits) {
             for (int dx = -ir; dx <= ir; ++dx) windowRoots.push_back(IntSqrt(a * a + dx * dx));
         const std::vector<float> cur = heights(size_t(n), -2.0f);
         const float* centre = sources.data() + size_t(ir) * plane + size_t(ir);
-        std::vector<float> wantInward(size_t(n), 7.0f);
-        reference.inwardRow(centre, ptrdiff_t(plane), ir, ir, ir, windowRoots.data(), cur.data(), wantInward.data(), n);
-
         const float gain = std::array<float, 3>{1.0f, 1.83f, 2.03f}[rng() % 3];
         const uint32_t firstColour = rng(), secondColour = rng();
-        std::vector<uint32_t> wantWords(size_t(n), 0xDEADBEEFu);
-        reference.colourise(first.data(), second.data(), n, gain, firstColour, secondColour, wantWords.data());
         const std::vector<uint8_t> mirroredFirst = bytes(size_t(n)), mirroredSecond = bytes(size_t(n));
         std::vector<uint8_t> coverage = bytes(size_t(n));
         for (size_t i = 0; i < coverage.size(); i += 3) coverage[i] = i % 2 ? 255 : 0;  // the two shortcuts
-        std::vector<uint32_t> wantTwoSided(size_t(n), 0xDEADBEEFu);
-        reference.twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(), coverage.data(),
-                           n, gain, firstColour, secondColour, wantTwoSided.data());
 
+        auto run = [&](const ReliefRows::Table& t) {
+            Outputs out;
+            for (auto& planes : out.light) planes[0] = second, planes[1] = first;
+            t.bevelLight(o, ptrdiff_t(stride), n, light, out.light[0][0].data(), out.light[0][1].data());
+            t.embossHardLight(o, ptrdiff_t(stride), n, light, out.light[1][0].data(), out.light[1][1].data());
+            t.embossSoftLight(o, in, ptrdiff_t(stride), n, light, out.light[2][0].data(), out.light[2][1].data());
+            out.swept = swept;
+            t.sweepSource(out.swept.data(), n, n, sourceX, r, 0, rows, left, right, disc, amount);
+            out.sides = sidesPoison;
+            t.sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive, out.sides.data());
+            out.nearRow.assign(size_t(n), 7.0f);
+            t.nearRow(squares.data() + reach, reach, n, out.nearRow.data());
+            out.inward.assign(size_t(n), 7.0f);
+            t.inwardRow(centre, ptrdiff_t(plane), ir, ir, ir, windowRoots.data(), cur.data(), out.inward.data(), n);
+            out.words.assign(size_t(n), 0xDEADBEEFu);
+            t.colourise(first.data(), second.data(), n, gain, firstColour, secondColour, out.words.data());
+            out.twoSided.assign(size_t(n), 0xDEADBEEFu);
+            t.twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(), coverage.data(), n,
+                       gain, firstColour, secondColour, out.twoSided.data());
+            return out;
+        };
+        const Outputs want = run(ReliefRows::ReferenceTable());
         for (const auto& v : variants) {
-            std::vector<uint8_t> got[3][2];
-            for (int k = 0; k < 3; ++k) got[k][0] = second, got[k][1] = first;
-            v.table->bevelLight(o, ptrdiff_t(stride), n, light, got[0][0].data(), got[0][1].data());
-            v.table->embossHardLight(o, ptrdiff_t(stride), n, light, got[1][0].data(), got[1][1].data());
-            v.table->embossSoftLight(o, in, ptrdiff_t(stride), n, light, got[2][0].data(), got[2][1].data());
+            const Outputs got = run(*v.table);
             for (int k = 0; k < 3; ++k)
-                ASSERT_TRUE(same(got[k][0], want[k][0]) && same(got[k][1], want[k][1]))
-                    << v.name << " light " << k << " width " << n;
-            std::vector<float> gotSwept = swept;
-            v.table->sweepSource(gotSwept.data(), n, n, sourceX, r, 0, rows, left, right, disc, amount);
-            ASSERT_TRUE(same(gotSwept, wantSwept)) << v.name << " sweep width " << n;
-            std::vector<uint8_t> gotSides = sidesPoison;
-            v.table->sweepSides(sideRows.data(), sideRows.data() + n, sideRows.data() + 2 * n, n, positive,
-                                gotSides.data());
-            ASSERT_TRUE(same(gotSides, wantSides)) << v.name << " sides width " << n;
-            std::vector<float> gotNear(size_t(n), 7.0f);
-            v.table->nearRow(squares.data() + reach, reach, n, gotNear.data());
-            ASSERT_TRUE(same(gotNear, wantNear)) << v.name << " near width " << n;
-            std::vector<float> gotInward(size_t(n), 7.0f);
-            v.table->inwardRow(centre, ptrdiff_t(plane), ir, ir, ir, windowRoots.data(), cur.data(), gotInward.data(), n);
-            ASSERT_TRUE(same(gotInward, wantInward)) << v.name << " inward width " << n;
-            std::vector<uint32_t> gotWords(size_t(n), 0xDEADBEEFu);
-            v.table->colourise(first.data(), second.data(), n, gain, firstColour, secondColour, gotWords.data());
-            ASSERT_TRUE(same(gotWords, wantWords)) << v.name << " colours width " << n;
-            std::vector<uint32_t> gotTwoSided(size_t(n), 0xDEADBEEFu);
-            v.table->twoSided(first.data(), second.data(), mirroredFirst.data(), mirroredSecond.data(),
-                              coverage.data(), n, gain, firstColour, secondColour, gotTwoSided.data());
-            ASSERT_TRUE(same(gotTwoSided, wantTwoSided)) << v.name << " two-sided width " << n;
+                ASSERT_TRUE(same(got.light[k][0], want.light[k][0]) && same(got.light[k][1], want.light[k][1]))
+                    << v.name << " light kernel " << k << " differs from the reference at width " << n;
+            ASSERT_TRUE(same(got.swept, want.swept)) << v.name << " sweepSource differs at width " << n;
+            ASSERT_TRUE(same(got.sides, want.sides)) << v.name << " sweepSides differs at width " << n;
+            ASSERT_TRUE(same(got.nearRow, want.nearRow)) << v.name << " nearRow differs at width " << n;
+            ASSERT_TRUE(same(got.inward, want.inward)) << v.name << " inwardRow differs at width " << n;
+            ASSERT_TRUE(same(got.words, want.words)) << v.name << " colourise differs at width " << n;
+            ASSERT_TRUE(same(got.twoSided, want.twoSided)) << v.name << " twoSided differs at width " << n;
         }
     }
 }
 
-TEST(ReliefKernels, LightVectorForAngleAndAltitudePairs) {
-    GxReliefLight l = ReliefLightVector(180.0f, 0.0f, 1);  // t = a = 0: along +x
-    EXPECT_TRUE(l.x == 1.0f && l.y == 0.0f && l.z == 0.0f);
-    l = ReliefLightVector(180.0f, 0.0f, 0);  // direction 0 negates x and y only
-    EXPECT_TRUE(l.x == -1.0f && l.z == 0.0f);
-    l = ReliefLightVector(0.0f, 0.0f, 1);  // t = 3.14159, short of pi: y keeps a rest
-    EXPECT_EQ(l.x, -1.0f);
-    EXPECT_TRUE(l.y > 2e-6f && l.y < 3e-6f);
-    l = ReliefLightVector(135.0f, 30.0f, 0);
-    EXPECT_NEAR(l.x, -0.70711f * 0.86603f, 1e-4f);
-    EXPECT_NEAR(l.y, -0.70711f * 0.86603f, 1e-4f);
-    EXPECT_NEAR(l.z, 0.5f, 1e-5f);
-    EXPECT_EQ(ReliefNormalZ(0.0f, kBevelVariant.depthFloor), 2.4f / 0.1f);
-    EXPECT_EQ(ReliefNormalZ(0.0f, kEmbossVariant.depthFloor), 2.4f / 0.2f);
-}
-
-TEST(ReliefKernels, LevelEdgeFactorPlaneWriteAndColouring) {
-    EXPECT_EQ(ReliefClampLevel(300.0f), 255.0f);
-    EXPECT_EQ(ReliefClampLevel(NAN), 0.0f);
-    EXPECT_EQ(ReliefEdgeFactor(0.5f), 128);  // 127.5 + 0.5
-    EXPECT_EQ(ReliefEdgeFactor(1.0f), 255);  // 255.5 capped
-    EXPECT_EQ(ReliefEdgeFactor(-2.0f), 0);
-    EXPECT_EQ(ReliefEdgeFactor(NAN), 0);
-    EXPECT_EQ(ReliefPlaneValue(0, 255), 0);            // (0 + 1) * 255 >> 8
-    EXPECT_EQ(ReliefPlaneValue(255 * 53, 128), 26);    // (52 + 1) * 128 >> 8
-    EXPECT_EQ(ReliefPlaneValue(256 * 257, 255), 255);  // 258 * 255 reaches 65536
-    EXPECT_EQ(ReliefPlaneValue(-4096, 255), 0);
-
-    // The stronger wash after the gain (truncated) wins; a tie takes the
-    // second colour, at alpha 0.
-    EXPECT_FALSE(ReliefTone(10, 10, 1.83f).first);
-    const uint8_t first[] = {200, 0, 1, 3};
-    const uint8_t second[] = {0, 100, 1, 2};
-    uint32_t out[4];
-    ReliefColourise(first, second, 4, 1.83f, 0xFF336699, 0x00FFFFFF, out);
-    EXPECT_EQ(out[0], 0xFF336699u);  // 366 capped at 255: the colour as it is
-    EXPECT_EQ(out[1], 0xB7B7B7B7u);  // 183 in the second colour; its own alpha is not read
-    EXPECT_EQ(out[2], 0u);           // tie
-    EXPECT_EQ(out[3], 0x02000001u);  // int(5.49) - int(3.66) = 2: blue (153 + 1) * 2 >> 8
-}
-
-TEST(ReliefKernels, BlursRotateThePlanesAndKeepOuterStrips) {
-    // 7 x 7 planes, second all 30, first all 90, radius 1 blurs: the outer
-    // ring is never written, so it shows which buffer went where.
-    auto ringOf = [](const uint8_t* p) {
-        std::vector<uint8_t> r;
-        for (int i = 0; i < 7; ++i) r.insert(r.end(), {p[i], p[42 + i], p[i * 7], p[i * 7 + 6]});
-        return std::all_of(r.begin(), r.end(), [&](uint8_t v) { return v == r[0]; }) ? int(r[0]) : -1;
-    };
-    // Smoothing with radius 0 (a smooth relief of a negative size) copies, but
-    // still rotates the buffers, so the softened ring differs from no smoothing.
-    struct Case { bool smooth; int radius, soften, secondRing, firstRing; };
-    for (Case c : {Case{true, 1, 0, 0, 30}, Case{true, 1, 1, 90, 0}, Case{false, 0, 1, 0, 30},
-                   Case{true, 0, 1, 90, 30}}) {
-        GxReliefPlanes p;
-        ASSERT_TRUE(p.Allocate(49));
-        std::memset(p.second, 30, 49);
-        std::memset(p.first, 90, 49);
-        ASSERT_TRUE(ReliefSmoothAndSoften(&p, 7, 7, c.smooth, c.radius, c.soften));
-        EXPECT_EQ(ringOf(p.second), c.secondRing) << c.smooth << c.radius << c.soften;
-        EXPECT_EQ(ringOf(p.first), c.firstRing) << c.smooth << c.radius << c.soften;
-    }
-    GxReliefPlanes p;
-    ASSERT_TRUE(p.Allocate(49));
-    EXPECT_FALSE(ReliefSmoothAndSoften(&p, 7, 7, true, -1, 0));  // would blur outside the planes
-}
-
-TEST(ReliefKernels, FramesAndSizes) {
+TEST(ReliefKernels, RefusalsAndSafeValues) {
     GxReliefFrame f;
     ASSERT_TRUE(ReliefPlanFrame(GxRect(10, 20, 10, 20), 4, &f));  // empty text: 2M x 2M
-    EXPECT_TRUE(f.width == 8 && f.height == 8 && f.x0 == 6 && f.y0 == 16);
-    EXPECT_FALSE(ReliefPlanFrame(GxRect(0, 0, 100, 100), 40000, &f));
+    EXPECT_TRUE(f.width == 8 && f.x0 == 6 && f.y0 == 16);
+    EXPECT_FALSE(ReliefPlanFrame(GxRect(0, 0, 100, 100), 40000, &f)) << "a frame past the size limit was planned";
     int r = -1;
-    EXPECT_TRUE(ReliefSizePixels(-3.7f, &r) && r == -3);  // toward zero, no clamp
     EXPECT_TRUE(ReliefSizePixels(NAN, &r) && r == 0);
-    EXPECT_FALSE(ReliefSizePixels(-1025.0f, &r));
-    EXPECT_TRUE(ReliefSizePixels(14.9f, &r) && r == 14);
-    EXPECT_TRUE(ReliefSizePixels(1024.9f, &r) && r == 1024);
-    EXPECT_FALSE(ReliefSizePixels(1025.0f, &r));  // the filters' radius limit
-    EXPECT_FALSE(ReliefSizePixels(1e30f, &r));
+    EXPECT_TRUE(ReliefSizePixels(1024.9f, &r) && r == 1024) << "1024 is the largest radius allowed";
+    for (float refused : {-1025.0f, 1025.0f, 1e30f}) EXPECT_FALSE(ReliefSizePixels(refused, &r)) << refused;
+    GxReliefPlanes planes;
+    ASSERT_TRUE(planes.Allocate(49));
+    EXPECT_FALSE(ReliefSmoothAndSoften(&planes, 7, 7, true, -1, 0)) << "would blur outside the planes";
+    EXPECT_EQ(ReliefPlaneValue(256 * 257, 255), 255) << "258 * 255 reaches 65536 and must cap";
 }
 
-// ---- properties of both layers
+// ---- what both layers must do
 
-struct BevelKind {
-    using Layer = GxBevel;
-    using Record = GxBevelProperty;
-    static int Margin(const ReliefParams& p) { return GxBevel::geometry(MakeRecord<Record>(p)).margin; }
-    // Outside this many pixels from the edge the field is flat. The bevel has
-    // one flat side: the ground of an outer bevel, the top of an inner one.
-    static int Reach(const ReliefParams& p) {
-        const GxBevelGeometry g = GxBevel::geometry(MakeRecord<Record>(p));
-        return g.range + g.smoothRadius + g.soften + 1;
+// Each layer draws source-over in one mode and destination-over in the
+// other; only the emboss draws into the extra target too. Then missing and
+// extreme input: nothing drawn, no margin kept, nothing read out of bounds.
+template <typename Layer, typename Record>
+void ExpectModesAndCleanRefusals(const GxReliefVariant& variant, std::vector<ReliefParams> cases) {
+    for (int separate : {0, 1}) {
+        ReliefCanvas c(12, 12, 14);
+        c.FillSquare(3);
+        for (size_t i = 0; i < size_t(c.dst.width) * c.dst.height * 4; ++i) c.dst.pixels[i] = i % 4 == 3 ? 255 : 128;
+        GxBitmap before(c.dst), extra(c.dst.width, c.dst.height, 4), empty(extra);
+        c.Run<Layer, Record>(Relief(0, 1, 5), separate, separate ? &extra : nullptr);
+        const int mode = separate ? variant.modeWithWorkImage : variant.modeWithoutWorkImage;
+        // Destination-over onto an opaque target changes nothing; source-over does.
+        EXPECT_EQ(SamePixels(before, c.dst), mode == 2) << "wrong blend mode, work image " << separate;
+        EXPECT_EQ(SamePixels(extra, empty), !(variant.drawsExtra && separate)) << "extra, work image " << separate;
     }
-    static bool FlatOutside(const ReliefParams& p) { return p.style != 1; }
-    static bool FlatInside(const ReliefParams& p) { return p.style == 1; }
-    static std::vector<ReliefParams> Cases() {
-        return {Relief(1, 0, 3), Relief(0, 1, 6, 4), Relief(1, 0, 15), Relief(0, 0, 15, 4)};
-    }
-    static ReliefParams Largest() { return Relief(0, 1, 120, 16); }  // windows to 2 * 122^2
-};
-
-struct EmbossKind {
-    using Layer = GxEmboss;
-    using Record = GxEmbossProperty;
-    static int Margin(const ReliefParams& p) { return GxEmboss::geometry(MakeRecord<Record>(p)).margin; }
-    static int Reach(const ReliefParams& p) {
-        const GxEmbossGeometry g = GxEmboss::geometry(MakeRecord<Record>(p));
-        return g.outRange + g.smoothRadius + g.soften + 1;
-    }
-    static bool FlatOutside(const ReliefParams&) { return true; }
-    static bool FlatInside(const ReliefParams&) { return true; }
-    static std::vector<ReliefParams> Cases() {
-        return {Relief(0, 1, 6), Relief(1, 1, 12, 3), Relief(0, 0, 9, 2), Relief(0, 0, 26, 4)};
-    }
-    static ReliefParams Largest() { return Relief(0, 1, 130, 16); }  // windows to 2 * 68^2
-};
-
-template <typename Kind>
-class ReliefLayer : public ::testing::Test {
-protected:
-    using Layer = typename Kind::Layer;
-    using Record = typename Kind::Record;
-    static void Run(ReliefCanvas& c, const ReliefParams& p, int separate = 0, GxBitmap* extra = nullptr) {
-        c.template Run<Layer, Record>(p, separate, extra);
-    }
-};
-using ReliefKinds = ::testing::Types<BevelKind, EmbossKind>;
-TYPED_TEST_SUITE(ReliefLayer, ReliefKinds);
-
-// Direction 0 negates the horizontal light: on a mask symmetric under a half
-// turn the picture turns half round, byte for byte, so the colours swap sides.
-TYPED_TEST(ReliefLayer, DirectionZeroTurnsThePictureHalfRound) {
-    std::vector<ReliefParams> cases = TypeParam::Cases();
-    cases.push_back(TypeParam::Largest());  // past the root table: proves the reads under ASan
-    for (ReliefParams p : cases) {
-        const bool largest = p.size > 100;
-        ReliefCanvas up(largest ? 5 : 15, largest ? 5 : 13, TypeParam::Margin(p) + 1);
-        up.FillPointSymmetric(5 + p.soften);
-        ReliefCanvas down = up;
-        this->Run(up, p);
-        p.direction = 0;
-        this->Run(down, p);
-        EXPECT_GT(up.DrawnPixels(), largest ? 1000 : 50);
-        EXPECT_TRUE(HalfTurnOf(up.dst, down.dst)) << "style " << p.style << " size " << p.size;
-    }
-}
-
-TYPED_TEST(ReliefLayer, TransparentColoursDrawNothingAndOneShowsOnlyTheOther) {
-    std::mt19937 rng(9);
-    for (ReliefParams p : TypeParam::Cases()) {
-        p.first &= 0x00FFFFFF;
-        p.second &= 0x00FFFFFF;
-        for (int separate : {0, 1}) {
-            ReliefCanvas c(10, 8, TypeParam::Margin(p));
-            c.FillPointSymmetric(3);
-            for (size_t i = 0; i < c.DstBytes(); ++i) c.dst.pixels[i] = uint8_t(rng());
-            GxBitmap before(c.dst), extra(c.dst);
-            this->Run(c, p, separate, &extra);
-            EXPECT_TRUE(SamePixels(before, c.dst) && SamePixels(before, extra)) << p.size << separate;
-        }
-    }
-    // Each plane is scaled by its own colour's alpha.
-    for (bool firstTransparent : {true, false}) {
-        ReliefParams p = TypeParam::Cases()[1];
-        (firstTransparent ? p.first : p.second) &= 0x00FFFFFF;
-        ReliefCanvas c(10, 10, TypeParam::Margin(p));
-        c.FillSquare(2);
-        this->Run(c, p);
-        int red = 0, blue = 0;
-        for (size_t i = 0; i < c.DstBytes(); i += 4) {
-            red += c.dst.pixels[i] != 0;
-            blue += c.dst.pixels[i + 2] != 0;
-        }
-        EXPECT_EQ(red == 0, firstTransparent);
-        EXPECT_EQ(blue == 0, !firstTransparent);
-        EXPECT_GT(red + blue, 20);
-    }
-}
-
-TYPED_TEST(ReliefLayer, FlatRegionsProduceNothing) {
-    for (ReliefParams p : TypeParam::Cases()) {
-        const int reach = TypeParam::Reach(p);
-        ReliefCanvas c(2 * reach + 20, 2 * reach + 20, TypeParam::Margin(p) + 2);
-        c.FillSquare(4);
-        this->Run(c, p);
-        const int lo = c.rect.left + 4, hi = c.rect.right - 4;  // full coverage on [lo, hi)
-        int flatSeen = 0, flatDrawn = 0;
-        for (int y = 0; y < int(c.dst.height); ++y) {
-            for (int x = 0; x < int(c.dst.width); ++x) {
-                const int out = std::max({lo - x, x - hi + 1, lo - y, y - hi + 1});
-                const bool flat = (out > reach && TypeParam::FlatOutside(p)) ||
-                                  (-out > reach && TypeParam::FlatInside(p));
-                flatSeen += flat;
-                flatDrawn += flat && c.Pixel(x, y)[3] != 0;
-            }
-        }
-        EXPECT_GT(c.DrawnPixels(), 100);
-        EXPECT_GE(flatSeen, 100);
-        EXPECT_EQ(flatDrawn, 0) << "style " << p.style << " size " << p.size;
-    }
-}
-
-TYPED_TEST(ReliefLayer, MissingAndExtremeInputIsClean) {
     ReliefCanvas c(6, 5, 3);
     c.FillSquare(1);
-    typename TypeParam::Layer bare;
+    Layer bare;
     GxECore::ParamPostProcessing pp{&c.dst, &c.mask, &c.rect, 0, nullptr};
     bare.doPostProcessing(&pp);  // no property
-    EXPECT_EQ(bare.getOffset(), 0);
-    typename TypeParam::Record record = MakeRecord<typename TypeParam::Record>(TypeParam::Cases()[0]);
+    Record record = MakeRecord<Record>(cases[0]);
     bare.setProperty(&record);
     bare.doPostProcessing(nullptr);
     pp.src = nullptr;
     bare.doPostProcessing(&pp);
-    EXPECT_EQ(c.DrawnPixels(), 0);
-
-    for (ReliefParams p : TypeParam::Cases()) {
+    EXPECT_EQ(c.DrawnPixels(), 0) << "drew without a record or a mask";
+    for (ReliefParams p : cases) {
         ReliefCanvas edge(8, 8, 0);  // text against every canvas edge (the exact
         edge.FillSquare(0);          // transform reads one column and row further)
-        this->Run(edge, p);
+        edge.Run<Layer, Record>(p);
         EXPECT_GT(edge.DrawnPixels(), 0);
-        ReliefCanvas empty(0, 0, TypeParam::Margin(p));  // a 2M x 2M frame
-        this->Run(empty, p);
+        ReliefCanvas none(0, 0, Layer::geometry(MakeRecord<Record>(p)).margin);  // a 2M x 2M frame
+        none.Run<Layer, Record>(p);
     }
-    for (float size : {1e9f, INFINITY, NAN, -50.0f}) {
-        ReliefParams p = Relief(0, 1, size);
-        ReliefCanvas t(6, 5, 3);
-        t.FillSquare(1);
-        this->Run(t, p);
+    for (float size : {1e9f, INFINITY, -50.0f, NAN}) {  // NaN last: it draws
+        c.Run<Layer, Record>(Relief(0, 1, size));
         // NaN acts as 0; -50 gives a frame smaller than the text and draws nothing.
-        EXPECT_EQ(t.DrawnPixels() > 0, size != size) << size;
-        typename TypeParam::Record huge = MakeRecord<typename TypeParam::Record>(p);
-        bare.setProperty(&huge);
-        if (size == size) {
-            EXPECT_EQ(bare.getOffset(), 0) << size;  // no margin either
-        }
+        EXPECT_EQ(c.DrawnPixels() > 0, size != size) << "size " << size;
+        Record refused = MakeRecord<Record>(Relief(0, 1, size));
+        bare.setProperty(&refused);
+        EXPECT_TRUE(size != size || bare.getOffset() == 0) << "a refused size " << size << " kept a margin";
     }
+}
+
+TEST(ReliefLayers, BlendModesAndMissingOrExtremeInput) {
+    // The largest sizes open windows past the root table (2 * 122^2, 2 * 68^2).
+    ExpectModesAndCleanRefusals<GxBevel, GxBevelProperty>(
+        kBevelVariant, {Relief(1, 0, 3), Relief(0, 1, 6, 4), Relief(0, 0, 15, 4), Relief(0, 1, 120, 16)});
+    ExpectModesAndCleanRefusals<GxEmboss, GxEmbossProperty>(
+        kEmbossVariant, {Relief(0, 1, 6), Relief(1, 1, 12, 3), Relief(0, 0, 26, 4), Relief(0, 1, 130, 16)});
+}
+
+// ---- each layer's own
+
+TEST(Bevel, RadiiAndMargins) {
+    struct Row { float size; int technique, soften, rs, rd, margin; bool exact; };
+    for (Row r : {Row{15, 0, 0, 11, 11, 33, true},   // 2 * 15 / 3 + 1 = 11
+                  Row{14, 0, 0, 11, 11, 33, true},   // 28 / 3 + 1 = 10.33: a real division
+                  Row{3, 0, 5, 3, 3, 13, false},     // soften wider than the smoothing
+                  Row{10, 1, 0, 0, 12, 12, false},   // hard: r + 2, never exact
+                  Row{-3, 1, 1, 0, -1, 1, false}}) { // a negative range only empties the windows
+        const auto g = GxBevel::geometry(MakeRecord<GxBevelProperty>(Relief(1, r.technique, r.size, r.soften)));
+        EXPECT_TRUE(g.drawable && g.smoothRadius == r.rs && g.range == r.rd && g.margin == r.margin &&
+                    g.exact == r.exact && g.gain == (r.technique == 0 ? 1.83f : 1.0f))
+            << "wrong geometry for size " << r.size << " technique " << r.technique;
+    }
+    // Refused: past the radius limit, a frame smaller than the text, a blur
+    // radius below zero.
+    for (ReliefParams p : {Relief(1, 0, 1e9f), Relief(1, 1, -3), Relief(1, 0, -3, 4)})
+        EXPECT_FALSE(GxBevel::geometry(MakeRecord<GxBevelProperty>(p)).drawable) << p.size;
+    GxBevel bevel;
+    GxBevelProperty record = MakeRecord<GxBevelProperty>(Relief(1, 0, 4.6f, 3));
+    bevel.setProperty(&record);
+    EXPECT_EQ(bevel.getOffset(), 3 + 5) << "the stack's margin is soften + size rounded";
+}
+
+TEST(Emboss, RadiiAndMargins) {
+    struct Row { float size; int technique, soften, ro, ri, rs, margin; bool exact; };
+    for (Row r : {Row{10, 1, 0, 8, 6, 0, 8, false},     // ceil(5 + 3), ceil(5 + 1)
+                  Row{25, 0, 0, 8, 8, 14, 36, false},   // local passes up to 25
+                  Row{26, 0, 16, 8, 8, 14, 40, true},   // the exact transform from 26
+                  Row{-9, 1, 2, -1, -3, 0, 3, false},   // negative ranges, frame from soften
+                  Row{-3, 0, 0, 1, 1, 0, 1, false}}) {  // smoothing radius 0 still smooths
+        const GxEmbossGeometry g =
+            GxEmboss::geometry(MakeRecord<GxEmbossProperty>(Relief(0, r.technique, r.size, r.soften)));
+        EXPECT_TRUE(g.drawable && g.outRange == r.ro && g.inRange == r.ri && g.smoothRadius == r.rs &&
+                    g.margin == r.margin && g.exact == r.exact && g.gain == (r.technique == 0 ? 2.03f : 1.0f))
+            << "wrong geometry for size " << r.size << " technique " << r.technique;
+    }
+    for (ReliefParams p : {Relief(0, 1, -9), Relief(0, 0, -4, 3)})  // M < 0; Rs = -1
+        EXPECT_FALSE(GxEmboss::geometry(MakeRecord<GxEmbossProperty>(p)).drawable) << p.size;
+    GxEmboss emboss;
+    GxEmbossProperty record = MakeRecord<GxEmbossProperty>(Relief(0, 0, 10.5f, 2));
+    emboss.setProperty(&record);
+    EXPECT_EQ(emboss.getOffset(), 7 + 2) << "ceil(5.25 + 1) + soften: int(10.5) would give 6";
 }
 
 }  // namespace

@@ -3,7 +3,7 @@ package jvmtest;
 import java.util.Arrays;
 import java.util.Objects;
 
-/** Assertions; a failed one throws AssertionError with both values. */
+/** Assertions; a failed one throws AssertionError saying what differed, in one line. */
 public final class Check {
     private Check() {}
 
@@ -13,53 +13,29 @@ public final class Check {
         }
     }
 
-    public static void equal(long expected, long actual, String what) {
-        if (expected != actual) {
-            throw new AssertionError(what + ": expected " + expected + ", got " + actual);
-        }
-    }
-
+    /** Values (ints also in hex, as pixels are), or int arrays (sizes, ink boxes, pictures: the first difference). */
     public static void equal(Object expected, Object actual, String what) {
-        if (!Objects.equals(expected, actual)) {
-            throw new AssertionError(what + ": expected " + expected + ", got " + actual);
+        if (expected instanceof int[] && actual instanceof int[]) {
+            int[] e = (int[]) expected, a = (int[]) actual;
+            int i = Arrays.mismatch(e, a);
+            isTrue(i < 0 || i < Math.min(e.length, a.length), what + ": " + a.length + " values, not " + e.length);
+            isTrue(i < 0, i < 0 ? "" : String.format("%s: value %d is %d (%08X), expected %d (%08X)", what, i, a[i],
+                    a[i], e[i], e[i]));
+        } else if (expected instanceof Integer && actual instanceof Integer) {
+            isTrue(expected.equals(actual), String.format("%s: expected %d (%08X), got %d (%08X)", what, expected,
+                    expected, actual, actual));
+        } else {
+            isTrue(Objects.equals(expected, actual), what + ": expected " + expected + ", got " + actual);
         }
     }
 
-    public static void equal(int[] expected, int[] actual, String what) {
-        if (!Arrays.equals(expected, actual)) {
-            throw new AssertionError(what + ": expected " + Arrays.toString(expected) + ", got "
-                    + Arrays.toString(actual));
-        }
-    }
-
-    /** Two 0xAARRGGBB pixels. */
-    public static void pixel(int expected, int actual, String what) {
-        if (expected != actual) {
-            throw new AssertionError(String.format("%s: expected pixel %08X, got %08X", what, expected, actual));
-        }
-    }
-
-    public static void isNull(Object value, String what) {
-        if (value != null) {
-            throw new AssertionError(what + ": expected null, got " + value);
-        }
-    }
-
-    public static void notNull(Object value, String what) {
-        if (value == null) {
-            throw new AssertionError(what + ": expected a value, got null");
-        }
-    }
-
-    /** Runs the action and returns what it threw, failing when it threw nothing of that kind. */
-    public static <T extends Throwable> T raises(Class<T> kind, Runnable action, String what) {
+    /** Runs the action, failing unless it throws that kind of exception. */
+    public static void raises(Class<? extends Throwable> kind, Runnable action, String what) {
         try {
             action.run();
         } catch (Throwable t) {
-            if (kind.isInstance(t)) {
-                return kind.cast(t);
-            }
-            throw new AssertionError(what + ": expected " + kind.getSimpleName() + ", got " + t, t);
+            isTrue(kind.isInstance(t), what + ": expected " + kind.getSimpleName() + ", got " + t);
+            return;
         }
         throw new AssertionError(what + ": expected " + kind.getSimpleName() + ", nothing was thrown");
     }

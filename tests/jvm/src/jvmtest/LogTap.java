@@ -1,14 +1,14 @@
 package jvmtest;
 
-import java.nio.charset.StandardCharsets;
-import java.util.ArrayList;
-import java.util.Arrays;
-import java.util.List;
+import static java.nio.charset.StandardCharsets.UTF_8;
+
+import java.nio.file.*;
+import java.util.*;
 
 /**
  * Captures the library's log lines. On Linux the library writes them to stderr as "P/tag: message" (with
  * GLIMMER_LOG_LEVEL=debug in the environment, which the test setup provides); while a capture runs, the
- * process's stderr goes to a temporary file instead. One capture at a time, from one thread.
+ * process's stderr goes to a temporary file instead. One capture at a time.
  */
 public final class LogTap {
     static {
@@ -17,46 +17,32 @@ public final class LogTap {
 
     private LogTap() {}
 
-    private static native void begin();
-
-    private static native byte[] end();
+    /** Sends stderr to the file at `path`, or back when `path` is null. */
+    private static native void redirect(String path);
 
     /** Runs the action; returns the lines written to stderr meanwhile. */
     public static synchronized List<String> capture(Runnable action) {
-        if (!"debug".equals(System.getenv("GLIMMER_LOG_LEVEL"))) {
-            throw new IllegalStateException("run with GLIMMER_LOG_LEVEL=debug");
-        }
-        begin();
-        byte[] written;
+        Check.isTrue("debug".equals(System.getenv("GLIMMER_LOG_LEVEL")), "run with GLIMMER_LOG_LEVEL=debug");
         try {
-            action.run();
-        } finally {
-            written = end();
-        }
-        List<String> lines = new ArrayList<>(Arrays.asList(new String(written, StandardCharsets.UTF_8).split("\n")));
-        lines.removeIf(String::isEmpty);
-        // Anything the JVM itself said goes on to the real stderr.
-        for (String line : lines) {
-            if (!line.matches("^[DIWE?]/.*")) {
-                System.err.println(line);
+            Path file = Files.createTempFile("gxe-log", ".txt");
+            redirect(file.toString());
+            try {
+                action.run();
+            } finally {
+                redirect(null);
             }
+            List<String> lines = Arrays.asList(new String(Files.readAllBytes(file), UTF_8).split("\n"));
+            Files.delete(file);
+            // Anything the JVM itself said goes on to the real stderr.
+            lines.stream().filter(line -> !line.matches("^[DIWE?]/.*")).forEach(System.err::println);
+            return lines;
+        } catch (java.io.IOException e) {
+            throw new AssertionError(e);
         }
-        return lines;
-    }
-
-    /** Whether `lines` holds exactly this line (priority letter, tag, message). */
-    public static boolean contains(List<String> lines, char priority, String tag, String message) {
-        return lines.contains(priority + "/" + tag + ": " + message);
     }
 
     /** How many of `lines` start with this prefix. */
-    public static int count(List<String> lines, String prefix) {
-        int n = 0;
-        for (String line : lines) {
-            if (line.startsWith(prefix)) {
-                n++;
-            }
-        }
-        return n;
+    public static long count(List<String> lines, String prefix) {
+        return lines.stream().filter(line -> line.startsWith(prefix)).count();
     }
 }

@@ -2,10 +2,7 @@ package android.graphics;
 
 /** Test stand-in: a typeface is only its style bits here. */
 public class Typeface {
-    public static final int NORMAL = 0;
-    public static final int BOLD = 1;
-    public static final int ITALIC = 2;
-    public static final int BOLD_ITALIC = 3;
+    public static final int NORMAL = 0, BOLD = 1, ITALIC = 2, BOLD_ITALIC = 3;
 
     private final int style;
 

@@ -4,21 +4,10 @@ import java.lang.reflect.Array;
 import java.util.ArrayList;
 import java.util.List;
 
-/** Test stand-in: text with spans; making one of another SpannableString copies its spans. */
+/** Test stand-in: text with spans, each over the whole text; a copy of one keeps its spans. */
 public class SpannableString implements CharSequence {
-    private static final class Span {
-        final Object what;
-        final int start, end;
-
-        Span(Object what, int start, int end) {
-            this.what = what;
-            this.start = start;
-            this.end = end;
-        }
-    }
-
     private final String text;
-    private final List<Span> spans = new ArrayList<>();
+    private final List<Object> spans = new ArrayList<>();
 
     public SpannableString(CharSequence source) {
         text = source.toString();
@@ -27,20 +16,12 @@ public class SpannableString implements CharSequence {
         }
     }
 
-    public void setSpan(Object what, int start, int end, int flags) {
-        spans.add(new Span(what, start, end));
-    }
+    public void setSpan(Object what, int start, int end, int flags) { spans.add(what); }
 
-    /** The spans of that kind overlapping start..end, in the order they were set. */
+    /** The spans of that kind, in the order they were set. */
     @SuppressWarnings("unchecked")
     public <T> T[] getSpans(int start, int end, Class<T> kind) {
-        List<T> found = new ArrayList<>();
-        for (Span s : spans) {
-            if (kind.isInstance(s.what) && s.start <= end && s.end >= start) {
-                found.add((T) s.what);
-            }
-        }
-        return found.toArray((T[]) Array.newInstance(kind, found.size()));
+        return spans.stream().filter(kind::isInstance).toArray(n -> (T[]) Array.newInstance(kind, n));
     }
 
     @Override public int length() { return text.length(); }

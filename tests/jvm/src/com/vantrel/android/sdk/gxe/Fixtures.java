@@ -3,216 +3,107 @@ package com.vantrel.android.sdk.gxe;
 import android.graphics.Paint;
 import android.text.Layout;
 import android.widget.TextView;
+import com.vantrel.android.sdk.gxe.util.GxError;
 import java.lang.reflect.Field;
+import java.util.List;
+import java.util.concurrent.CompletableFuture;
+import java.util.function.Supplier;
+import jvmtest.*;
 
-/** Shared set-up for the bridge tests: fonts, views, one-line layouts, handles and ink boxes. */
+/** Shared set-up for the bridge tests: texts, one-line layouts, handles, ink boxes, calls on fresh threads. */
 final class Fixtures {
     static final String SANS = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf";
-    static final String SERIF = "/usr/share/fonts/truetype/dejavu/DejaVuSerif.ttf";
     /** U+2588 FULL BLOCK: one solid rectangle of ink, so covered pixels are known without the font's outlines. */
     static final String BLOCK = "\u2588";
 
     private Fixtures() {}
 
-    static TextView view(int width, int height) {
-        TextView view = new TextView();
-        view.setSize(width, height);
-        view.setMaxLines(10);
-        return view;
+    /** One line of all of `text`: baseline, ascent (negative) and descent, an em of width a character. */
+    static Layout line(CharSequence text, int baseline, int ascent, int descent) {
+        return new Layout(text, new float[] {0, text.length(), baseline, ascent, descent, 0f, -ascent * text.length()});
     }
 
-    static Paint paint(float size) {
-        Paint paint = new Paint();
-        paint.setTextSize(size);
-        return paint;
-    }
-
-    /** One line holding all of `text`, its baseline at `baseline`, left edge at `left`. */
-    static Layout line(CharSequence text, int baseline, int ascent, int descent, float left, float width) {
-        return new Layout(text, 1000, new Layout.Line(0, text.length(), text.length(), baseline + ascent,
-                baseline, baseline + descent, ascent, descent, left, width));
-    }
-
-    /** A text in DejaVu Sans with paint, view and one line of `text` set. */
-    static GxText text(String text, TextView view, float size, int baseline) {
+    /** `text` in `font` (null: none) at `size` pixels in a `width` x `height` view, the baseline at 4/5. */
+    static GxText text(String font, String text, int width, int height, float size) {
         GxText t = new GxText();
-        jvmtest.Check.isTrue(t.GxText_SetFont(SANS), "SetFont");
-        jvmtest.Check.isTrue(t.GxText_SetPaint(paint(size)), "SetPaint");
-        jvmtest.Check.isTrue(t.GxText_SetView(view), "SetView");
-        jvmtest.Check.isTrue(t.GxText_SetLayout(line(text, baseline, -(int) size, (int) (size / 4), 0f,
-                size * text.length())), "SetLayout");
+        Check.isTrue((font == null || t.GxText_SetFont(font)) && t.GxText_SetPaint(new Paint(size))
+                && t.GxText_SetView(new TextView(width, height))
+                && t.GxText_SetLayout(line(text, height * 4 / 5, -(int) size, (int) size / 4)), "set-up");
         return t;
     }
 
-    static int handleOf(GxText text) {
-        try {
-            return handleField().getInt(text);
-        } catch (IllegalAccessException e) {
-            throw new AssertionError(e);
+    /** Where a 20-pixel BLOCK in DejaVu Sans puts ink, with its baseline at 40 in a 60 x 50 view. */
+    static int[] blockInk() {
+        try (GxText text = text(SANS, BLOCK, 60, 50, 20f)) {
+            return inkBox(text.render());
         }
     }
 
-    static void setHandle(GxText text, int handle) {
-        try {
-            handleField().setInt(text, handle);
-        } catch (IllegalAccessException e) {
-            throw new AssertionError(e);
-        }
-    }
-
-    private static Field handleField() {
-        try {
-            Field f = GxText.class.getDeclaredField("mHandle");
-            f.setAccessible(true);
-            return f;
-        } catch (NoSuchFieldException e) {
-            throw new AssertionError(e);
-        }
-    }
-
-    /** {left, top, right, bottom} (right and bottom exclusive) of the pixels with any alpha, or null. */
-    static int[] inkBox(int[] pixels, int width, int height) {
-        int left = width, top = height, right = 0, bottom = 0;
-        for (int y = 0; y < height; y++) {
-            for (int x = 0; x < width; x++) {
-                if ((pixels[y * width + x] >>> 24) != 0) {
-                    left = Math.min(left, x);
-                    top = Math.min(top, y);
-                    right = Math.max(right, x + 1);
-                    bottom = Math.max(bottom, y + 1);
-                }
+    /** {left, top, right, bottom} (right and bottom exclusive) of the view's pixels with any alpha, or null. */
+    static int[] inkBox(GxText.Picture p) {
+        int[] pixels = viewPixels(p);
+        int width = p.getWidth() - p.getLeft() - p.getRight(), left = width, top = -1, right = 0, bottom = 0;
+        for (int i = 0; i < pixels.length; i++) {
+            if ((pixels[i] >>> 24) != 0) {
+                left = Math.min(left, i % width);
+                top = top < 0 ? i / width : top;
+                right = Math.max(right, i % width + 1);
+                bottom = i / width + 1;
             }
         }
-        return right == 0 ? null : new int[] {left, top, right, bottom};
-    }
-
-    static int[] inkBox(GxText.Picture p) {
-        return inkBox(p.getPixels(), p.getWidth(), p.getHeight());
+        return top < 0 ? null : new int[] {left, top, right, bottom};
     }
 
     /** The pixels of the view's own area of a picture (the effect margins cut off), row by row. */
-    static int[] viewPixels(GxText.Picture p, int viewWidth, int viewHeight) {
-        int[] pixels = new int[viewWidth * viewHeight];
-        for (int y = 0; y < viewHeight; y++) {
-            for (int x = 0; x < viewWidth; x++) {
-                pixels[y * viewWidth + x] = p.getPixel(x + p.getLeft(), y + p.getTop());
-            }
+    static int[] viewPixels(GxText.Picture p) {
+        int width = p.getWidth() - p.getLeft() - p.getRight();
+        int[] pixels = new int[width * (p.getHeight() - p.getTop() - p.getBottom())];
+        for (int i = 0; i < pixels.length; i++) {
+            pixels[i] = p.getPixel(i % width + p.getLeft(), i / width + p.getTop());
         }
         return pixels;
     }
 
-    /**
-     * Where a 20-pixel BLOCK drawn with its pen at (0, 0) puts ink: {left, top, right, bottom}, measured once
-     * from a plain render with the baseline at 30. Placement tests compare against it, so they check where
-     * lines go, not how the rasteriser covers a glyph.
-     */
-    static synchronized int[] blockInk() {
-        if (blockInk == null) {
-            try (GxText t = text(BLOCK, view(60, 50), 20f, 30)) {
-                int[] box = inkBox(t.render());
-                jvmtest.Check.notNull(box, "calibration ink");
-                blockInk = new int[] {box[0], box[1] - 30, box[2], box[3] - 30};
-            }
-        }
-        return blockInk.clone();
+    /** The field the natives keep a text's handle in. */
+    static Field handle() throws NoSuchFieldException {
+        Field handle = GxText.class.getDeclaredField("mHandle");
+        handle.setAccessible(true);
+        return handle;
     }
 
-    private static int[] blockInk;
-
-    /** The ink box expected for a 20-pixel BLOCK with its pen at (x, baseline). */
-    static int[] blockAt(int x, int baseline) {
-        int[] ink = blockInk();
-        return new int[] {ink[0] + x, ink[1] + baseline, ink[2] + x, ink[3] + baseline};
-    }
-
-    /** Whether any pixel of rows top..bottom-1 has alpha. */
-    static boolean inkInRows(GxText.Picture p, int top, int bottom) {
-        for (int y = Math.max(0, top); y < Math.min(p.getHeight(), bottom); y++) {
-            for (int x = 0; x < p.getWidth(); x++) {
-                if ((p.getPixel(x, y) >>> 24) != 0) {
-                    return true;
-                }
-            }
-        }
-        return false;
-    }
-
-    /** Whether no native text has this handle (any more). */
-    static boolean isReleased(int handle) {
+    /** Collects garbage until no native text has this handle any more; fails after a few seconds. */
+    static void awaitRelease(int handle) throws Exception {
         GxText probe = new GxText();
-        setHandle(probe, handle);
-        try {
-            return errorAfter(() -> probe.GxText_SetLine(1)) == com.vantrel.android.sdk.gxe.util.GxError.NOT_BOUND;
-        } finally {
-            setHandle(probe, -1);
-            probe.close();
-        }
-    }
-
-    /** Collects garbage until the native text of `handle` is released; fails after a few seconds. */
-    static void awaitRelease(int handle) {
-        for (int round = 0; round < 400; round++) {
-            if (isReleased(handle)) {
-                return;
-            }
+        handle().setInt(probe, handle);
+        for (int round = 0; round < 400 && errorAfter(() -> probe.GxText_SetLine(1)) != GxError.NOT_BOUND; round++) {
             System.gc();
-            try {
-                Thread.sleep(10);
-            } catch (InterruptedException e) {
-                throw new AssertionError(e);
-            }
+            Thread.sleep(10);
         }
-        throw new AssertionError("native text " + handle + " was never released");
+        Check.equal(GxError.NOT_BOUND, errorAfter(() -> probe.GxText_SetLine(1)), "native text " + handle + " gone");
     }
 
-    /** What a call left on a fresh thread: its result, and the thread's reason and error code after it. */
-    static final class Outcome {
-        Object result;
-        String reason;
-        int code;
-
-        /** Checks that the call failed with `expected` as its result, a reason saying `words` and `code`. */
-        void failed(Object expected, String words, int expectedCode, String what) {
-            jvmtest.Check.equal(expected, result, what + " result");
-            jvmtest.Check.isTrue(reason != null && reason.contains(words),
-                    what + ": reason \"" + reason + "\" does not say \"" + words + "\"");
-            jvmtest.Check.equal(expectedCode, code, what + " error code");
-        }
-    }
-
-    static Outcome onFreshThread(java.util.function.Supplier<Object> call) {
-        Outcome outcome = new Outcome();
-        outcome.code = errorAfter(() -> {
-            outcome.result = call.get();
-            outcome.reason = com.vantrel.android.sdk.gxe.util.GxError.getLastReason();
-        });
-        return outcome;
-    }
-
-    /** Runs the action on a new thread and returns that thread's error code afterwards. */
-    static int errorAfter(Runnable action) {
+    /**
+     * Runs the call on a fresh thread: it must return `expected` with a reason saying `words`, no error code,
+     * and the log line `line` (null: no error line at all).
+     */
+    static void refused(String what, Object expected, String words, String line, Supplier<Object> call) {
+        Object[] out = new Object[2];
         int[] code = {-1};
-        Throwable[] thrown = {null};
-        Thread thread = new Thread(() -> {
-            try {
-                action.run();
-                code[0] = com.vantrel.android.sdk.gxe.util.GxError.getLastError();
-            } catch (Throwable t) {
-                thrown[0] = t;
-            }
-        });
-        thread.start();
-        try {
-            thread.join();
-        } catch (InterruptedException e) {
-            throw new AssertionError(e);
-        }
-        if (thrown[0] instanceof RuntimeException) {
-            throw (RuntimeException) thrown[0];
-        }
-        if (thrown[0] != null) {
-            throw new AssertionError(thrown[0]);
-        }
-        return code[0];
+        List<String> log = LogTap.capture(() -> code[0] = errorAfter(() -> {
+            out[0] = call.get();
+            out[1] = GxError.getLastReason();
+        }));
+        Check.equal(expected, out[0], what);
+        Check.isTrue(out[1] != null && ((String) out[1]).contains(words), what + ": reason " + out[1]);
+        Check.equal(GxError.NONE, code[0], what + ": error code");
+        Check.isTrue(line == null ? LogTap.count(log, "E/") == 0 : log.contains(line), what + ": log " + log);
+    }
+
+    /** The error code a fresh thread has after running the action. */
+    static int errorAfter(Runnable action) {
+        return CompletableFuture.supplyAsync(() -> {
+            action.run();
+            return GxError.getLastError();
+        }, task -> new Thread(task).start()).join();
     }
 }
