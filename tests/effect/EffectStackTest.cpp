@@ -277,6 +277,33 @@ TEST(EffectStackDrawing, GlyphsUniteIntoTheMaskAndTheBoxTheLayersAreGiven) {
     EXPECT_EQ(draw({{&gb, {10, 1}}}), (B{})) << "a layer was called for a box off the mask";
 }
 
+// The same two rules with a real stroke, on the bytes they change: an inside
+// stroke (size 1) over the text reaches the corner only from the right box.
+TEST(EffectStackDrawing, BoxRulesDecideTheStrokedCorner) {
+    unsigned char full[4] = {255, 255, 255, 255};
+    GxGlyph square{full, 2, 2, 0, 0}, line{full, 0, 3, 0, 0};
+    GxEffect s(nullptr);
+    s.addStrokeText(1, 0xFF0000FF, 1, 0, 2);
+    s.addText(0xFF000000);
+    auto draw = [&](GxBitmap& dst, std::vector<std::pair<GxGlyph*, std::array<int, 2>>> glyphs) {
+        std::memset(dst.pixels, 0, size_t(dst.width) * dst.height * 4);
+        s.initEffect(dst.width, dst.height);
+        s.setDstBitmap(&dst);
+        for (auto& [glyph, at] : glyphs) s.renderEffectLayer(at[0], at[1], glyph);
+        s.doEffectPostProcessing();
+        const std::array<int, 4> box = Box(*s.getTextRect());
+        s.compositeLayers(&dst);
+        return box;
+    };
+    using B = std::array<int, 4>;
+    GxBitmap wide(8, 5, 4), narrow(6, 5, 4);
+    EXPECT_EQ(draw(wide, {{&square, {2, 2}}, {&line, {6, 1}}}), (B{2, 1, 6, 4}));
+    EXPECT_EQ(At(wide, 0)[3], 255) << "the 0x3 glyph's box must let the stroke cover the corner (a 2x2 box gives 149)";
+    EXPECT_EQ(draw(narrow, {{&square, {2, 2}}}), (B{2, 2, 4, 4}));
+    EXPECT_EQ(draw(narrow, {}), (B{2, 2, 4, 4})) << "a drawing without glyphs keeps the last box";
+    EXPECT_EQ(At(narrow, 0)[2], 255) << "and strokes from it over the empty mask";
+}
+
 // --- the final merge
 
 TEST(EffectStackComposite, WorkImageShowsWhereCoverageIsEmpty) {

@@ -424,6 +424,7 @@ TEST(Bevel, RadiiAndMargins) {
                   Row{14, 0, 0, 11, 11, 33, true},   // 28 / 3 + 1 = 10.33: a real division
                   Row{3, 0, 5, 3, 3, 13, false},     // soften wider than the smoothing
                   Row{10, 1, 0, 0, 12, 12, false},   // hard: r + 2, never exact
+                  Row{-1, 1, 0, 0, 1, 1, false},     // int(-1) = -1 toward zero: Rd = -1 + 2
                   Row{-3, 1, 1, 0, -1, 1, false}}) { // a negative range only empties the windows
         const auto g = GxBevel::geometry(MakeRecord<GxBevelProperty>(Relief(1, r.technique, r.size, r.soften)));
         EXPECT_TRUE(g.drawable && g.smoothRadius == r.rs && g.range == r.rd && g.margin == r.margin &&
@@ -445,6 +446,7 @@ TEST(Emboss, RadiiAndMargins) {
     for (Row r : {Row{10, 1, 0, 8, 6, 0, 8, false},     // ceil(5 + 3), ceil(5 + 1)
                   Row{25, 0, 0, 8, 8, 14, 36, false},   // local passes up to 25
                   Row{26, 0, 16, 8, 8, 14, 40, true},   // the exact transform from 26
+                  Row{-2, 1, 0, 2, 0, 0, 2, false},     // int(-2) = -2: Ro = 2, Ri = 0
                   Row{-9, 1, 2, -1, -3, 0, 3, false},   // negative ranges, frame from soften
                   Row{-3, 0, 0, 1, 1, 0, 1, false}}) {  // smoothing radius 0 still smooths
         const GxEmbossGeometry g =
