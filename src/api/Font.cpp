@@ -37,15 +37,7 @@ std::map<std::string, std::shared_ptr<const FontData>>& Cache() {
 
 // Measures face 0 of the font in `bytes`; false when it is no font.
 bool Measure(const char* bytes, std::size_t size, FontData* out) {
-    Glimmer::Platform::FontMetrics metrics;
-    if (!Glimmer::Platform::ReadFontMetrics(bytes, size, &metrics)) return false;
-    out->familyName = std::move(metrics.familyName);
-    out->unitsPerEm = metrics.unitsPerEm;
-    out->boxTop = metrics.boxTop;
-    out->boxBottom = metrics.boxBottom;
-    out->ascent = metrics.ascent;
-    out->descent = metrics.descent;
-    return true;
+    return Glimmer::Platform::ReadFontMetrics(bytes, size, &out->metrics);
 }
 
 std::string Quoted(std::string_view text) {
@@ -88,12 +80,12 @@ Result<Font> Load(const std::string& key, const char* bytes, std::size_t size, c
 }  // namespace
 
 FontExtent FontData::ExtentAt(float textSize) const {
-    const float scale = textSize / unitsPerEm;
+    const float scale = textSize / metrics.unitsPerEm;
     FontExtent extent;
-    extent.top = int(std::floor(-boxTop * scale));
-    extent.ascent = int(std::lround(-ascent * scale));
-    extent.descent = int(std::lround(-descent * scale));
-    extent.bottom = int(std::ceil(-boxBottom * scale));
+    extent.top = int(std::floor(-metrics.boxTop * scale));
+    extent.ascent = int(std::lround(-metrics.ascent * scale));
+    extent.descent = int(std::lround(-metrics.descent * scale));
+    extent.bottom = int(std::ceil(-metrics.boxBottom * scale));
     return extent;
 }
 
@@ -146,7 +138,7 @@ Result<Font> Font::fromBytes(const void* data, std::size_t size, std::string_vie
 
 const std::string& Font::familyName() const noexcept {
     static const std::string none;
-    return data_ != nullptr ? data_->familyName : none;
+    return data_ != nullptr ? data_->metrics.familyName : none;
 }
 
 }  // namespace glimmer

@@ -6,6 +6,7 @@
 #include <string>
 
 #include "glimmer/glimmer.h"
+#include "platform/FontMetrics.h"
 
 namespace glimmer::detail {
 
@@ -20,14 +21,7 @@ struct FontExtent {
 
 struct FontData {
     std::string key;          // the core's name for the font: a path, or a name for bytes
-    std::string familyName;
-    // Font units, y up: the box from the font's bounds; ascent and descent
-    // from the horizontal header, or the typographic ones when the font asks.
-    float unitsPerEm = 0.0f;
-    float boxTop = 0.0f;
-    float boxBottom = 0.0f;
-    float ascent = 0.0f;
-    float descent = 0.0f;
+    Glimmer::Platform::FontMetrics metrics;  // font units, y up
 
     FontExtent ExtentAt(float textSize) const;
 };

@@ -12,6 +12,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "effect/GxKernelVariant.h"
+
 namespace Glimmer::BlendRows {
 
 // The final unpremultiply divides 256 q by the new alpha a (q, a < 256). With
@@ -78,10 +80,7 @@ const Table& ScalarTable();
 const Table& Active();
 
 // Every compiled variant this CPU can run, for the tests.
-struct Variant {
-    const char* name;
-    const Table* table;
-};
+using Variant = KernelTargets::Variant<Table>;
 std::vector<Variant> Variants();
 
 }  // namespace Glimmer::BlendRows

@@ -22,6 +22,7 @@
 #include <cstdint>
 #include <vector>
 
+#include "effect/GxKernelVariant.h"
 #include "effect/filters/GxGaussian.h"
 
 namespace Glimmer::BlurRows {
@@ -72,10 +73,7 @@ const Table& ReferenceTable();
 const Table& Active();
 
 // Every compiled variant this CPU can run, for the tests.
-struct Variant {
-    const char* name;
-    const Table* table;
-};
+using Variant = KernelTargets::Variant<Table>;
 std::vector<Variant> Variants();
 
 }  // namespace Glimmer::BlurRows

@@ -17,6 +17,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "effect/GxKernelVariant.h"
+
 namespace Glimmer::ReliefRows {
 
 // What the lighting of one relief needs besides the field.
@@ -128,10 +130,7 @@ const Table& ReferenceTable();
 const Table& Active();
 
 // Every compiled variant this CPU can run, for the tests.
-struct Variant {
-    const char* name;
-    const Table* table;
-};
+using Variant = KernelTargets::Variant<Table>;
 std::vector<Variant> Variants();
 
 }  // namespace Glimmer::ReliefRows

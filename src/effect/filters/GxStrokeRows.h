@@ -22,6 +22,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "effect/GxKernelVariant.h"
+
 namespace Glimmer::StrokeRows {
 
 struct Term {
@@ -54,10 +56,7 @@ const Table& ReferenceTable();
 const Table& Active();
 
 // Every compiled variant this CPU can run, for the tests.
-struct Variant {
-    const char* name;
-    const Table* table;
-};
+using Variant = KernelTargets::Variant<Table>;
 std::vector<Variant> Variants();
 
 }  // namespace Glimmer::StrokeRows
