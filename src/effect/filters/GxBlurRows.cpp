@@ -49,27 +49,42 @@ HWY_INLINE V32 Divide(D32 d32, V32 x, V32 multiplier, int shift) {
 // take the columns of each 128-bit block in halves, and the saturating pack
 // at the end (also per block) puts them back in order.
 template <class D16>
-HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n,
-                                const GxGaussian& g, bool inverted, uint8_t* HWY_RESTRICT out) {
-    const int R = g.radius;
-    const int* w = g.weights;
-    const hn::Rebind<uint8_t, D16> d8;
-    const hn::Repartition<int32_t, D16> di32;
-    const hn::Repartition<uint32_t, D16> du32;
-    const hn::Repartition<int16_t, D16> di16;
-    const int N = int(hn::Lanes(d16));
-    const auto multiplier = hn::Set(du32, uint32_t(g.divide.multiplier));
-    const int shift = int(g.divide.shift);
-    const auto full = hn::Set(du32, g.full);
-    const auto most = hn::Set(du32, 255u);
+struct PairedTaps {
+    using D8 = hn::Rebind<uint8_t, D16>;
+    using DI32 = hn::Repartition<int32_t, D16>;
+    using DU32 = hn::Repartition<uint32_t, D16>;
+    using DI16 = hn::Repartition<int16_t, D16>;
+    using V16 = hn::Vec<DI16>;
+    using V32 = hn::Vec<DI32>;
+    D8 d8;
+    DI32 di32;
+    DU32 du32;
+    DI16 di16;
+    hn::Vec<DU32> multiplier, full, most;
+    int shift;
+    bool inverted;
     // Weights of taps 2k and 2k + 1 as one 32-bit pattern (0 past the last tap).
     uint32_t pairs[kMaxFilterRadius / 2 + 1];
-    for (int i = 0; i <= R; i += 2) pairs[i / 2] = uint32_t(w[i]) | (i < R ? uint32_t(w[i + 1]) << 16 : 0u);
-    auto pair = [&](const uint8_t* at, ptrdiff_t offset) {
-        return hn::BitCast(di16, hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, at - offset)),
-                                         hn::PromoteTo(d16, hn::LoadU(d8, at + offset))));
-    };
-    auto finish = [&](hn::Vec<decltype(di32)> lo, hn::Vec<decltype(di32)> hi, uint8_t* to) {
+
+    HWY_INLINE PairedTaps(const GxGaussian& g, bool invert)
+        : multiplier(hn::Set(du32, uint32_t(g.divide.multiplier))),
+          full(hn::Set(du32, g.full)),
+          most(hn::Set(du32, 255u)),
+          shift(int(g.divide.shift)),
+          inverted(invert) {
+        const int R = g.radius;
+        for (int i = 0; i <= R; i += 2)
+            pairs[i / 2] = uint32_t(g.weights[i]) | (i < R ? uint32_t(g.weights[i + 1]) << 16 : 0u);
+    }
+    HWY_INLINE V16 weightsOf(int i) const { return hn::BitCast(di16, hn::Set(du32, pairs[i / 2])); }
+    // lo/hi += the weights of a tap pair times the samples a (tap 2k) and b (tap 2k + 1).
+    HWY_INLINE void accumulate(V16 a, V16 b, V16 wv, V32& lo, V32& hi) const {
+        V32 unused = hn::Zero(di32);  // the second sum, which these lanes never need
+        lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
+        hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
+    }
+    // The sums divided by the weight sum (inverted first if asked), as bytes.
+    HWY_INLINE void finish(V32 lo, V32 hi, uint8_t* to) const {
         auto sumLo = hn::BitCast(du32, lo), sumHi = hn::BitCast(du32, hi);
         if (inverted) {
             sumLo = hn::Sub(full, sumLo);
@@ -78,15 +93,25 @@ HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_
         const auto qLo = hn::BitCast(di32, hn::Min(Divide(du32, sumLo, multiplier, shift), most));
         const auto qHi = hn::BitCast(di32, hn::Min(Divide(du32, sumHi, multiplier, shift), most));
         hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, to);
+    }
+};
+
+template <class D16>
+HWY_INLINE int BlurBlocksPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n,
+                                const GxGaussian& g, bool inverted, uint8_t* HWY_RESTRICT out) {
+    const int R = g.radius;
+    const int N = int(hn::Lanes(d16));
+    const PairedTaps<D16> taps(g, inverted);
+    const auto d8 = taps.d8;
+    const auto di16 = taps.di16;
+    const auto di32 = taps.di32;
+    auto pair = [&](const uint8_t* at, ptrdiff_t offset) {
+        return hn::BitCast(di16, hn::Add(hn::PromoteTo(d16, hn::LoadU(d8, at - offset)),
+                                         hn::PromoteTo(d16, hn::LoadU(d8, at + offset))));
     };
-    using V16 = hn::Vec<decltype(di16)>;
-    using V32 = hn::Vec<decltype(di32)>;
-    auto unused = hn::Zero(di32);
-    auto accumulate = [&](V16 a, V16 b, V16 wv, V32& lo, V32& hi) {
-        lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
-        hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
-    };
-    auto weightsOf = [&](int i) { return hn::BitCast(di16, hn::Set(du32, pairs[i / 2])); };
+    auto finish = [&](auto lo, auto hi, uint8_t* to) { taps.finish(lo, hi, to); };
+    auto accumulate = [&](auto a, auto b, auto wv, auto& lo, auto& hi) { taps.accumulate(a, b, wv, lo, hi); };
+    auto weightsOf = [&](int i) { return taps.weightsOf(i); };
     int x = 0;
     // Two blocks at a time share the weights and the loop.
     for (; x + 2 * N <= n; x += 2 * N) {
@@ -141,37 +166,16 @@ template <class D16>
 HWY_INLINE bool BlurRowsPaired(D16 d16, const uint8_t* HWY_RESTRICT c, ptrdiff_t step, int n, const GxGaussian& g,
                                bool inverted, uint8_t* HWY_RESTRICT out0, uint8_t* HWY_RESTRICT out1) {
     const int R = g.radius;
-    const int* w = g.weights;
-    const hn::Rebind<uint8_t, D16> d8;
-    const hn::Repartition<int32_t, D16> di32;
-    const hn::Repartition<uint32_t, D16> du32;
-    const hn::Repartition<int16_t, D16> di16;
     const int N = int(hn::Lanes(d16));
     if (n < N) return false;
-    const auto multiplier = hn::Set(du32, uint32_t(g.divide.multiplier));
-    const int shift = int(g.divide.shift);
-    const auto full = hn::Set(du32, g.full);
-    const auto most = hn::Set(du32, 255u);
-    uint32_t pairs[kMaxFilterRadius / 2 + 1];
-    for (int i = 0; i <= R; i += 2) pairs[i / 2] = uint32_t(w[i]) | (i < R ? uint32_t(w[i + 1]) << 16 : 0u);
-    using V16 = hn::Vec<decltype(di16)>;
-    using V32 = hn::Vec<decltype(di32)>;
-    auto finish = [&](V32 lo, V32 hi, uint8_t* to) {
-        auto sumLo = hn::BitCast(du32, lo), sumHi = hn::BitCast(du32, hi);
-        if (inverted) {
-            sumLo = hn::Sub(full, sumLo);
-            sumHi = hn::Sub(full, sumHi);
-        }
-        const auto qLo = hn::BitCast(di32, hn::Min(Divide(du32, sumLo, multiplier, shift), most));
-        const auto qHi = hn::BitCast(di32, hn::Min(Divide(du32, sumHi, multiplier, shift), most));
-        hn::StoreU(hn::DemoteTo(d8, hn::ReorderDemote2To(di16, qLo, qHi)), d8, to);
-    };
-    auto unused = hn::Zero(di32);
-    auto accumulate = [&](V16 a, V16 b, V16 wv, V32& lo, V32& hi) {
-        lo = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveLower(di16, a, b), wv, lo, unused);
-        hi = hn::ReorderWidenMulAccumulate(di32, hn::InterleaveUpper(di16, a, b), wv, hi, unused);
-    };
-    auto weightsOf = [&](int i) { return hn::BitCast(di16, hn::Set(du32, pairs[i / 2])); };
+    const PairedTaps<D16> taps(g, inverted);
+    using V16 = typename PairedTaps<D16>::V16;
+    const auto d8 = taps.d8;
+    const auto di16 = taps.di16;
+    const auto di32 = taps.di32;
+    auto finish = [&](auto lo, auto hi, uint8_t* to) { taps.finish(lo, hi, to); };
+    auto accumulate = [&](auto a, auto b, auto wv, auto& lo, auto& hi) { taps.accumulate(a, b, wv, lo, hi); };
+    auto weightsOf = [&](int i) { return taps.weightsOf(i); };
     auto block = [&](int x) {
         const uint8_t* at = c + x;
         auto s = [&](int k) { return hn::BitCast(di16, hn::PromoteTo(d16, hn::LoadU(d8, at + ptrdiff_t(k) * step))); };
